@@ -1,0 +1,103 @@
+// An INI settings file held in memory as sections of key-value lines. Lookups of sections and keys
+// ignore ASCII case and keep the spelling on disk; each costs constant average time. A file opened
+// and written back unchanged is byte-identical. Close(1) replaces the file atomically and never
+// replaces an existing file that this object did not load. Not thread-safe.
+
+#ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
+#define VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
+
+#include <memory>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+#include "foundation/inifile/ini_line.h"
+#include "foundation/string/string_base.h"
+
+class vxMappedINIFile {
+ public:
+  vxMappedINIFile();
+  explicit vxMappedINIFile(const char* filename);
+  explicit vxMappedINIFile(const vxStringBase& filename);
+  virtual ~vxMappedINIFile();  // frees the lines; never writes
+
+  vxMappedINIFile(const vxMappedINIFile&) = delete;
+  vxMappedINIFile& operator=(const vxMappedINIFile&) = delete;
+
+  // Rebinds the object to another file name, so that Close(1) writes there. The content stays.
+  void SetFilename(const char* filename);
+  void SetFilename(const vxStringBase& filename);
+  const vxStringBase& GetFilename() const { return filename_; }
+
+  // Reads the file into sections, replacing any content. 0 on success; non-zero when the file
+  // cannot be read (missing, unreadable, a folder) and, with flag 1, when it holds a NUL byte (a
+  // binary file is never taken for settings). On failure the object stays bound to its name and
+  // empty, so a later Close(1) still creates a missing file.
+  int Open(unsigned int flag = 1);
+
+  // save 1: writes the sections back atomically (temporary file in the same folder, then rename;
+  // the file's mode kept). save 0: drops the changes. Returns 0 on success; 1 when writing failed or
+  // was refused because the file exists but was not loaded by this object.
+  int Close(unsigned int save);
+  // As Close, and with save 1 the file and its folder are also flushed to disk before returning.
+  int CloseFW(unsigned int save);
+
+  // The value, or an empty text when the section or key is absent (nothing is created).
+  const vxStringBase& GetVal(const vxStringBase& section, const vxStringBase& key) const;
+  // Fills value (emptied when absent). 0 when the key was found, non-zero otherwise.
+  int GetVal(const vxStringBase& section, const vxStringBase& key, vxStringBase& value) const;
+  // The value of key within one section's lines (a linear walk: sections handed out are small).
+  const vxStringBase& GetVal(const INILineList* lines, const vxStringBase& key) const;
+
+  // Sets the value, adding the key after the section's last property line (and the section at the
+  // end of the file) when absent. With a key present twice, the first one is set.
+  void SetVal(const vxStringBase& section, const vxStringBase& key, const vxStringBase& value);
+  void SetVal(const vxStringBase& section, const vxStringBase& key, long value);
+
+  // Removes the first property line with that key; 0 when one was removed, 1 when absent.
+  int RemoveKey(const vxStringBase& section, const vxStringBase& key);
+
+  // The section's lines, or null when there is no such section.
+  INILineList* GetPropertyList(const char* section);
+  INILineList* GetPropertyList(const vxStringBase& section);
+  const INILineList* GetPropertyList(const vxStringBase& section) const;
+
+  // Adds a section holding copies of the given lines at the end of the file. When the section
+  // exists already it keeps its lines and gains copies of the keys it lacks (this file wins).
+  void AddMapSection(const char* section, const INILineList* lines);
+  // Sets, in an existing section, every key of the given lines to the given value, adding keys it
+  // lacks; keys the lines do not hold stay. A missing section is added as by AddMapSection.
+  void UpdateMapSection(const char* section, const INILineList* lines);
+
+  // Adds every section and key of other that this file lacks; where both hold a key, this file's
+  // value stays (the destination wins). New keys go after their section's last property line, new
+  // sections at the end, both in other's order.
+  void MergeFrom(const vxMappedINIFile& other);
+
+  // Renames a section in place (its lines stay). 0 on success; 1 when from is absent or to exists.
+  int RenameSection(const vxStringBase& from, const vxStringBase& to);
+  // Section names in file order, spelt as on disk.
+  std::vector<vxStringBase> GetSectionNames() const;
+  bool HasSection(const vxStringBase& section) const;
+  // True after a successful Open.
+  bool IsLoaded() const { return loaded_; }
+
+ private:
+  struct Section;
+  Section* FindSection(std::string_view name) const;
+  Section* FindOrAddSection(const vxStringBase& name);
+  void Clear();
+  int Write(bool flushToDisk);
+
+  vxStringBase filename_;
+  bool loaded_ = false;
+  std::string preamble_;       // lines before the first section, as read
+  std::string defaultEol_;     // line end used for new lines: the file's first, else "\n"
+  std::vector<std::unique_ptr<Section>> sections_;                    // file order
+  std::unordered_map<std::string, Section*> sectionIndex_;            // folded name -> section
+
+  friend class INIFileReader;
+  friend class INIFileWriter;
+};
+
+#endif  // VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_

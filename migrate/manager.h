@@ -1,0 +1,185 @@
+// The migration manager: one run of the library, from the host's command line to the last log
+// line, and every operation that migration plug-ins call back. The manager owns its parser, its log
+// and its two version descriptors. No operation throws; results are integers (0 success or nothing
+// to do, 1 refusal or a missing file, 2 where said). Everything runs on the caller's thread.
+//
+// The operations are spread over files by concern: manager.cpp (construction, log, run sequence),
+// checks.cpp, servers.cpp, exclusion.cpp, copy.cpp, ini_merge.cpp, profiles.cpp, user_files.cpp,
+// languages.cpp, log_profiles.cpp, alert_profiles.cpp, categories.cpp, main_settings.cpp,
+// log_settings.cpp, keywords.cpp, data_files.cpp, advanced_options.cpp, obx_profiles.cpp,
+// protected_values.cpp.
+
+#ifndef VXMIGRATE_MIGRATE_MANAGER_H_
+#define VXMIGRATE_MIGRATE_MANAGER_H_
+
+#include <cstdint>
+
+#include "foundation/files/log_file.h"
+#include "foundation/string/string_base.h"
+#include "foundation/string/version.h"
+#include "migrate/cmdline_parser.h"
+
+// What a plug-in's "MigrateInitialize" fills in: the pair of products it migrates between, and four
+// further texts for its own use (emptied before the call, never read by the run).
+struct vxMigrateInfo {
+  vxStringBase sourceProduct;
+  vxStringBase destinationProduct;
+  vxStringBase note1;
+  vxStringBase note2;
+  vxStringBase note3;
+  vxStringBase note4;
+};
+
+class vxMigrationManager;
+
+// The two entry points a migration plug-in exports with C linkage. Their results are ignored.
+extern "C" {
+typedef int (*vxMigrateInitializeEntry)(vxMigrateInfo* info);
+typedef int (*vxMigrateEntry)(vxMigrationManager* manager);
+}
+
+class vxMigrationManager {
+ public:
+  // Builds the run from the host's arguments, falling back on "migcmd.ini" when the command line
+  // is incomplete. An incomplete run leaves IsValid() false and writes nothing anywhere.
+  vxMigrationManager(int argc, char** argv);
+  virtual ~vxMigrationManager();
+
+  vxMigrationManager(const vxMigrationManager&) = delete;
+  vxMigrationManager& operator=(const vxMigrationManager&) = delete;
+
+  bool IsValid() const;
+  // REQUIRES: IsValid(). The whole run: checks, plug-in search and call, install script, last line.
+  int DoMigration();
+
+  // One log entry at level 1; nothing without a log.
+  void Log(const char* text);
+  // text immediately followed by value, as one entry.
+  void Log(const char* text, const char* value);
+
+  MigrationCmdLineParser* GetCmdLineParser() { return m_cmdLineParser; }
+  vxStringBase& GetSourceVersion() { return m_sourceVersion; }
+  vxStringBase& GetDestinationVersion() { return m_destinationVersion; }
+  vxStringBase& GetSourceDirectory() { return m_sourceDirectory; }
+  vxStringBase& GetDestinationDirectory() { return m_destinationDirectory; }
+  const vxStringBase& GetSourceProduct() const { return m_sourceProduct; }
+  const vxStringBase& GetDestinationProduct() const { return m_destinationProduct; }
+  const vxStringBase& GetExecutable() const { return m_executable; }
+  // These assign the text only: version descriptors and product ids are not rebuilt.
+  void SetSourceVersion(const vxStringBase& text) { m_sourceVersion = text; }
+  void SetDestinationVersion(const vxStringBase& text) { m_destinationVersion = text; }
+  void SetSourceDirectory(const vxStringBase& text) { m_sourceDirectory = text; }
+  void SetDestinationDirectory(const vxStringBase& text) { m_destinationDirectory = text; }
+  int GetSourceProductID() const { return m_sourceProductID; }
+  int GetDestinationProductID() const { return m_destinationProductID; }
+  vxVersionDescriptor* GetSourceVersionDescriptor() { return m_sourceVersionDescriptor; }
+  vxVersionDescriptor* GetDestinationVersionDescriptor() { return m_destinationVersionDescriptor; }
+  vxLogFile* GetLog() { return m_log; }
+
+  // Service hooks around a plug-in's Migrate; this platform has no service manager: each returns 0.
+  int StopAMService();
+  int DeleteAMService();
+  int StartAMService();
+
+  // --- Product identity and version checks (checks.cpp) ---
+  // The product id (1..21) of an id text, ignoring case; -1 when unknown or empty.
+  static int GetProductID(const char* text);
+  // 0 when the run may start, 1 otherwise (each failure logs its own line).
+  int DoCheckMigrateValidity();
+  // 0 supported, 1 outside "vxmigrate.ini"'s ranges, 2 "vxmigrate.ini" could not be opened.
+  int DoCheckVersions(const vxStringBase& sourceSection, const vxStringBase& destinationSection);
+  int DoBadMigration();
+  bool IsInlineMigrate() const;
+  // Source folder text equals the destination folder text exactly.
+  bool IsInPlaceMigrate() const;
+  // The installation folder joined with a name relative to it ("\vantix.ini").
+  vxStringBase GetFullSourceFilename(const char* name) const;
+  vxStringBase GetFullDestinationFilename(const char* name) const;
+
+  // --- Running-server detection (servers.cpp); which: 0 destination folder, 1 source folder ---
+  int CheckEngineRunning(int productID, const vxVersionDescriptor& version, int which);
+  int CheckInterfaceRunning(int productID, const vxVersionDescriptor& version, int which);
+  int readPid(const char* path);
+  bool sendNullSignal(int pid);
+
+  // --- Exclusion lists (exclusion.cpp) ---
+  int IsExcludeFile(const vxStringBase& file, const vxStringBase& list,
+                    const vxStringBase& inPlaceExtension, int fromInstallation);
+  void MakeFullExclusionList(vxStringBase& result, const vxStringBase& selection,
+                             const vxStringBase& folder, const char* extension,
+                             const char* fixedList);
+
+  // --- File and folder copying (copy.cpp) ---
+  int CopyFilesOfType(const char* extension, unsigned int copyOption);
+  int CopyFilesOfTypes(const vxStringBase& extensions, unsigned int copyOption);
+  int CopyFiles(const vxStringBase& fileNames, unsigned int copyOption);
+  int CopyAllFilesOfType(const vxStringBase& extension, const vxStringBase& exclusions);
+  int CopyFilesInRelativeFolder(const vxStringBase& relativeFolder, const char* extension,
+                                unsigned int copyOption);
+
+  // --- INI merging (ini_merge.cpp) ---
+  int MergeINIFiles(const char* sourceFile, const char* destinationFile);
+  int MergeINIFilesRelative(const char* sourceRelative, const char* destinationRelative);
+  int MergeAllINIFiles(const vxStringBase& exclusions);
+
+  // --- Profiles (profiles.cpp, user_files.cpp, languages.cpp, log_profiles.cpp,
+  //     alert_profiles.cpp, categories.cpp, obx_profiles.cpp) ---
+  int CopyProfilesOfTypes(const vxStringBase& extensions, unsigned int option);
+  int CopyAllProfilesOfType(const vxStringBase& extension, const vxStringBase& exclusions);
+  int CopyRenamedUserFiles(const char* folder, const char* pattern, const char* extension,
+                           const char* exclusions);
+  int CopyScheduledEventFiles(const char* folder, const char* pattern, const char* extension,
+                              const char* namePattern);
+  int DoCopyLanguageFiles(const char* sourceFolder, const char* destinationFolder);
+  int DoCopyLogProfiles(const char* folder, const char* pattern, const char* extension,
+                        const char* fixedList);
+  int DoCopyLinkProfiles(const char* folder, const char* pattern, const char* extension,
+                         const char* fixedList);
+  int DoCopyAlertProfiles(const char* folder, const char* pattern, const char* extension,
+                          const char* fixedList);
+  void MergeCategoriesINIFile(const char* profileFolder, const char* pattern,
+                              const char* extension, const char* exclusionList, bool keepNames);
+  int DoCopyOBXProfiles();
+
+  // --- Product settings (main_settings.cpp, log_settings.cpp, keywords.cpp, data_files.cpp,
+  //     advanced_options.cpp) ---
+  int DoVantixINIMerge();
+  int DoVXMLogINIChange();
+  int DoTableLimitINIChange();
+  int DoKeywordINIMerge();
+  int DoMergeCSVFile(const char* sourceFile, const char* destinationFile);
+  int MergeAdvancedOptionsFiles(const vxStringBase& sourceFile, const vxStringBase& destinationFile,
+                                const vxStringBase& prefix);
+  int DoOBXMergeAdvancedOptionsFiles();
+
+  // --- Protected values (protected_values.cpp) ---
+  int DoConvertEncryptedValue(vxStringBase& value);
+  int DoDecryptValue(vxStringBase& value);
+
+  // True when option "FT" is absent, empty, "Y" or "Yes" (ignoring case): profile data folders
+  // travel with their profiles.
+  bool CopiesProfileDataFolders() const;
+
+ private:
+  void ReadCommandFile();
+  void FindExecutable(const char* programName);
+  void OpenLog();
+  void RunPlugins(bool& found);
+  void RunInstallScript();
+
+  vxStringBase m_sourceVersion;
+  vxStringBase m_sourceDirectory;
+  vxStringBase m_destinationVersion;
+  vxStringBase m_destinationDirectory;
+  vxStringBase m_sourceProduct;
+  vxStringBase m_destinationProduct;
+  vxStringBase m_executable;
+  int32_t m_sourceProductID = -1;
+  int32_t m_destinationProductID = -1;
+  vxVersionDescriptor* m_sourceVersionDescriptor = nullptr;
+  vxVersionDescriptor* m_destinationVersionDescriptor = nullptr;
+  vxLogFile* m_log = nullptr;
+  MigrationCmdLineParser* m_cmdLineParser = nullptr;
+};
+
+#endif  // VXMIGRATE_MIGRATE_MANAGER_H_
