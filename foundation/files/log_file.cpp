@@ -1,0 +1,61 @@
+// The run log. Every entry is assembled in memory and handed to the kernel with one write, so
+// entries never interleave and a crash loses nothing that was logged before it.
+
+#include "foundation/files/log_file.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstring>
+#include <ctime>
+#include <string>
+
+namespace {
+
+std::string TimeStamp() {
+  time_t now = time(nullptr);
+  struct tm local;
+  char text[32] = "0000-00-00 00:00:00";
+  if (localtime_r(&now, &local) != nullptr) strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &local);
+  return text;
+}
+
+}  // namespace
+
+vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
+  int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
+  fd_ = open(filename_.c_str(), flags, 0644);
+}
+
+vxLogFile::~vxLogFile() {
+  if (fd_ >= 0) close(fd_);
+}
+
+void vxLogFile::Log(const char* text, LogLevel level) {
+  if (level > m_level) return;
+  WriteEntry(text, nullptr);
+}
+
+void vxLogFile::Log(const char* text, const char* text2, LogLevel level) {
+  if (level > m_level) return;
+  WriteEntry(text, text2);
+}
+
+void vxLogFile::WriteEntry(const char* text, const char* text2) {
+  if (fd_ < 0) return;
+  std::string entry = TimeStamp();
+  entry += "  ";
+  if (text != nullptr) entry += text;
+  if (text2 != nullptr) entry += text2;
+  entry += '\n';
+  const char* data = entry.data();
+  size_t left = entry.size();
+  while (left > 0) {
+    ssize_t written = write(fd_, data, left);
+    if (written < 0 && errno == EINTR) continue;
+    if (written <= 0) return;  // a full disk loses the entry, never the run
+    data += written;
+    left -= static_cast<size_t>(written);
+  }
+}

@@ -1,0 +1,273 @@
+// The manager's construction (command line, command file, executable, log header), its log, and
+// the run sequence: checks, plug-in search in sorted listing order, the install script, last line.
+
+#include "migrate/manager.h"
+
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <string>
+
+#include "foundation/files/file_info.h"
+#include "foundation/files/file_manager.h"
+#include "foundation/files/filename.h"
+#include "foundation/files/shared_lib.h"
+#include "foundation/inifile/ini_file.h"
+#include "foundation/string/tokenizer.h"
+#include "src/proc2/proc2.h"
+
+namespace {
+
+const char kCommandFileName[] = "migcmd.ini";
+const char kLogFileName[] = "vxmigrate.log";
+const char kInstallScriptName[] = "synchinstall.sh";
+const char kPointerLine[] = "** See VXMigrate Log File for details:  ";
+
+bool EndsWithSeparator(const vxStringBase& text) {
+  return text.length() > 0 && (text.at(text.length() - 1) == '/' || text.at(text.length() - 1) == '\\');
+}
+
+// folder + separator (unless it already ends in one) + name.
+vxStringBase JoinFolder(const vxStringBase& folder, const char* name) {
+  vxStringBase path(folder);
+  if (!EndsWithSeparator(path)) path.append(vxFileManager::m_slash);
+  path.append(name);
+  return path;
+}
+
+bool PathExists(const vxStringBase& path) { return access(path.c_str(), F_OK) == 0; }
+
+}  // namespace
+
+vxMigrationManager::vxMigrationManager(int argc, char** argv) {
+  m_cmdLineParser = new MigrationCmdLineParser(argc, argv);
+  m_cmdLineParser->ParseCommand();
+  if (!m_cmdLineParser->IsValid()) {
+    ReadCommandFile();
+    if (!m_cmdLineParser->IsValid()) return;  // incomplete run: no log, nothing written
+  }
+
+  m_sourceDirectory = m_cmdLineParser->GetValue("D1");
+  m_destinationDirectory = m_cmdLineParser->GetValue("D2");
+  FindExecutable(argc > 0 && argv != nullptr ? argv[0] : nullptr);
+  m_sourceVersion = m_cmdLineParser->GetValue("V1");
+  m_destinationVersion = m_cmdLineParser->GetValue("V2");
+  m_sourceProduct = m_cmdLineParser->GetValue("P1");
+  m_destinationProduct = m_cmdLineParser->GetValue("P2");
+  m_sourceProductID = GetProductID(m_sourceProduct.c_str());
+  m_destinationProductID = GetProductID(m_destinationProduct.c_str());
+  m_sourceVersionDescriptor = new vxVersionDescriptor(m_sourceVersion);
+  m_destinationVersionDescriptor = new vxVersionDescriptor(m_destinationVersion);
+  OpenLog();
+}
+
+vxMigrationManager::~vxMigrationManager() {
+  delete m_log;
+  delete m_sourceVersionDescriptor;
+  delete m_destinationVersionDescriptor;
+  delete m_cmdLineParser;
+}
+
+bool vxMigrationManager::IsValid() const {
+  return m_cmdLineParser != nullptr && m_cmdLineParser->IsValid() == 1;
+}
+
+void vxMigrationManager::Log(const char* text) {
+  if (m_log == nullptr) return;
+  m_log->m_level = kLogNormal;
+  m_log->Log(text, kLogNormal);
+}
+
+void vxMigrationManager::Log(const char* text, const char* value) {
+  if (m_log == nullptr) return;
+  m_log->m_level = kLogNormal;
+  m_log->Log(text, value, kLogNormal);
+}
+
+// The command file fills in what the command line lacks: its "main" keys overwrite the options of
+// the same name and its "profiles" keys become the "PF" options, present or not.
+void vxMigrationManager::ReadCommandFile() {
+  const vxStringBase& cmd = m_cmdLineParser->GetValue("cmd");
+  vxStringBase moduleDirectory;
+  vxFileManager::GetModuleDirectory(moduleDirectory);
+  vxStringBase path;
+  if (cmd.isEmpty()) {
+    path = moduleDirectory;
+    path.append(kCommandFileName);
+  } else if (vxFilename::IsDirectory(cmd.c_str())) {
+    path = JoinFolder(cmd, kCommandFileName);
+  } else if (cmd.find('\\') == vxStringBase::BadIndex && cmd.find('/') == vxStringBase::BadIndex) {
+    path = moduleDirectory;
+    path.append(cmd);
+  } else {
+    path = cmd;
+  }
+  if (!PathExists(path)) return;
+  vxMappedINIFile commandFile(path);
+  if (commandFile.Open(0) != 0) return;
+
+  static const char* const kMainKeys[] = {"D1", "D2", "P1", "P2", "V1", "V2", "FT"};
+  for (const char* key : kMainKeys) {
+    m_cmdLineParser->SetValue(key, commandFile.GetVal("main", key));
+  }
+  static const char* const kProfileKeys[][2] = {{"Log", "PFLog"},
+                                                {"Proxy", "PFProxy"},
+                                                {"Stream", "PFStream"},
+                                                {"Link", "PFLink"},
+                                                {"Alert", "PFAlert"}};
+  for (const auto& key : kProfileKeys) {
+    m_cmdLineParser->SetValue(key[1], commandFile.GetVal("profiles", key[0]));
+  }
+  commandFile.Close(0);
+  m_cmdLineParser->Validate();
+}
+
+// The full path of the running program, found as a shell would from argv[0].
+void vxMigrationManager::FindExecutable(const char* programName) {
+  vxStringBase name(programName);
+  if (name.isEmpty()) return;
+  if (name.at(0) == '/') {
+    m_executable = vxFilename(name).Pathname();
+    return;
+  }
+  if (name.at(0) == '.' || name.find('/') != vxStringBase::BadIndex) {
+    if (name.at(0) != '.') name.prepend("./");
+    vxStringBase directory;
+    vxFileManager::GetCurrentDirectory(directory);
+    vxFileManager::MakePath(m_executable, directory, name, 1);
+    return;
+  }
+  const char* pathVariable = getenv("PATH");
+  if (pathVariable == nullptr) return;
+  vxBStringTokenizer tokenizer(vxStringBase(pathVariable), ":", true);
+  vxStringBase folder;
+  while (tokenizer.GetNext(folder)) {
+    vxStringBase candidate;
+    vxFileManager::MakePath(candidate, folder, name, 1);
+    vxFileInfo info{vxFilename(candidate)};
+    if (info.Exists() && (info.Mode() & 0100) != 0) {
+      m_executable = info.GetFilename().Pathname();
+      return;
+    }
+  }
+}
+
+void vxMigrationManager::OpenLog() {
+  vxStringBase path;
+  vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
+  m_log = new vxLogFile(path, 1);
+  Log("VXMigrate Log File: ", m_log->GetFilename().c_str());
+  Log("VXMigrate Executable: ", m_executable.c_str());
+  Log("Source Path: ", m_sourceDirectory.c_str());
+  Log("Destination Path: ", m_destinationDirectory.c_str());
+  Log("Source Version: ", m_sourceVersion.c_str());
+  Log("Destination Version: ", m_destinationVersion.c_str());
+  Log("Source Product: ", m_sourceProduct.c_str());
+  Log("Destination Product: ", m_destinationProduct.c_str());
+  Log("\r\n\r\n");
+}
+
+int vxMigrationManager::DoMigration() {
+  int result = DoCheckMigrateValidity();
+  if (result != 0) {
+    Log(kPointerLine, m_log->GetFilename().c_str());
+    return result;
+  }
+  bool found = false;
+  RunPlugins(found);
+  RunInstallScript();
+  if (!found) {
+    Log("Error: No appropriate migration libraries found.  There may not be support for the "
+        "products or versions being migrated.  Check the readme file for more info.");
+  }
+  Log(kPointerLine, m_log->GetFilename().c_str());
+  return 0;
+}
+
+// Tries the "*.so" files beside the executable in sorted order. The first plug-in that declares
+// the run's products and accepts its versions ends the search, whether or not it has "Migrate".
+void vxMigrationManager::RunPlugins(bool& found) {
+  found = false;
+  vxStringBase folder = vxFilename(m_executable).Directory();
+  vxFileInfoList plugins;
+  vxFileManager::GetFileList(folder, "*.so", plugins, 1);
+  vxMigrateInfo info;
+  for (const vxFileInfo& entry : plugins) {
+    vxSharedLib library(entry.GetFilename().Pathname().c_str());
+    auto initialize =
+        reinterpret_cast<vxMigrateInitializeEntry>(library.ProcAddr("MigrateInitialize"));
+    if (initialize == nullptr) continue;  // not a shared object, or not a migration plug-in
+
+    for (vxStringBase* field : {&info.sourceProduct, &info.destinationProduct, &info.note1,
+                                &info.note2, &info.note3, &info.note4}) {
+      field->makeNull();
+    }
+    try {
+      initialize(&info);
+    } catch (...) {
+      Log("Error: Migration library failed to initialize: ", entry.GetFilename().Pathname().c_str());
+      continue;
+    }
+    if (!m_sourceProduct.equals(info.sourceProduct, false) ||
+        !m_destinationProduct.equals(info.destinationProduct, false)) {
+      continue;
+    }
+    int versions = DoCheckVersions(info.sourceProduct, info.destinationProduct);
+    if (versions == 2) {
+      Log("Error: Can't open vxmigrate.ini - make sure it's present and isn't read only");
+      return;
+    }
+    if (versions == 1) continue;
+
+    auto migrate = reinterpret_cast<vxMigrateEntry>(library.ProcAddr("Migrate"));
+    found = migrate != nullptr;
+    if (found) {
+      DeleteAMService();
+      StopAMService();
+      try {
+        migrate(this);
+      } catch (...) {
+        // A plug-in's exception must not reach the host: the run still ends with its last lines.
+        Log("Error: Migration library failed: ", entry.GetFilename().Pathname().c_str());
+      }
+      StartAMService();
+    }
+    return;
+  }
+}
+
+// Runs "synchinstall.sh" from the destination folder, waiting for it without a time limit.
+void vxMigrationManager::RunInstallScript() {
+  vxStringBase script = JoinFolder(m_destinationDirectory, kInstallScriptName);
+  std::string line = "Looking for Synch Install Script: " + script.str();
+  Log(line.c_str());
+  if (!PathExists(script)) return;
+
+  line = "Executing Synch Install Script: " + script.str();
+  Log(line.c_str());
+  char previous[4095];
+  bool havePrevious = getcwd(previous, sizeof previous) != nullptr;
+  if (chdir(m_destinationDirectory.c_str()) != 0) {
+    // The script's outcome is not inspected; it simply runs from wherever we are.
+  }
+  std::string command = std::string("./") + kInstallScriptName;
+  line = "Spawning Script: " + command;
+  Log(line.c_str());
+  vxProc2 process;
+  process.Spawn(command.c_str(), nullptr, nullptr, 1, 6);
+  if (havePrevious && chdir(previous) != 0) {
+    // Nothing sensible to do: the run is over apart from its last lines.
+  }
+  Log("Done executing Synch Install Script.");
+}
+
+int vxMigrationManager::StopAMService() { return 0; }
+int vxMigrationManager::DeleteAMService() { return 0; }
+int vxMigrationManager::StartAMService() { return 0; }
+
+bool vxMigrationManager::CopiesProfileDataFolders() const {
+  const vxStringBase& option = m_cmdLineParser->GetValue("FT");
+  return option.isEmpty() || option.equals("Y", false) || option.equals("Yes", false);
+}
