@@ -1,0 +1,105 @@
+// Copies the analysis profiles of one OBX reporting-server installation into another, each under a
+// new name ending in "_vxmigrate" so that it never meets the destination's own profiles, with its
+// report and database folders when the run carries profile data. A copy present already is never
+// redone, and the edition's sample profiles stay behind.
+
+#include <unistd.h>
+
+#include "foundation/files/file_info.h"
+#include "foundation/files/file_manager.h"
+#include "foundation/inifile/ini_file.h"
+#include "migrate/internal/exclusion_name_set.h"
+#include "migrate/manager.h"
+#include "migrate/sample_lists.h"
+
+namespace {
+
+const char kProfiles[] = "\\vxm_vxx\\datfiles\\profiles";
+const char kReports[] = "\\vxm_vxx\\datfiles\\reports";
+const char kDatabases[] = "\\vxm_vxx\\datfiles\\databases";
+const char kServerSettings[] = "/vxm_vxx/vxm_vxx.ini";
+
+// The source's profile folder must lie inside its installation: a short name, or one starting
+// "./" or with a backslash third (".x\profiles"). Anything else is taken for an absolute folder
+// whose profiles belong to no installation being migrated.
+bool IsInstallationProfileFolder(const vxStringBase& folder) {
+  if (folder.length() <= 2) return true;
+  return folder.at(0) == '.' && (folder.at(1) == '/' || folder.at(2) == '\\');
+}
+
+}  // namespace
+
+int vxMigrationManager::DoCopyOBXProfiles() {
+  if (IsInPlaceMigrate()) return 0;
+
+  vxMappedINIFile destinationSettings(GetFullDestinationFilename(kServerSettings));
+  if (destinationSettings.Open(1) != 0) return 1;
+  vxStringBase destinationProfiles;
+  vxFileManager::MakePath(destinationProfiles, m_destinationDirectory, kProfiles, 0);
+  vxMappedINIFile sourceSettings(GetFullSourceFilename(kServerSettings));
+  if (sourceSettings.Open(1) != 0) return 1;
+
+  const vxStringBase profilesDir = sourceSettings.GetVal("defaults", "profilesdir");
+  if (!IsInstallationProfileFolder(profilesDir)) return 0;
+  vxStringBase sourceProfiles;
+  vxFileManager::MakePath(sourceProfiles, m_sourceDirectory,
+                          profilesDir.isEmpty() ? vxStringBase(kProfiles) : profilesDir, 0);
+
+  vxFileInfoList profiles;
+  vxFileManager::GetFileList(sourceProfiles, "*.wlp", profiles, 0);
+  // The list is the same for every profile of the folder: built once.
+  vxStringBase exclusions;
+  MakeFullExclusionList(exclusions, m_cmdLineParser->GetValue("PFLog"), kProfiles, "wlp",
+                        GetSampleFileList("obx", "wlp"));
+  const vxExclusionNameSet excluded(exclusions, IsInPlaceMigrate(), vxStringBase::NullStr);
+  const bool copyData = CopiesProfileDataFolders();
+
+  for (const vxFileInfo& entry : profiles) {
+    const vxFilename& file = entry.GetFilename();
+    const vxStringBase name = file.Filename();
+    if (excluded.Contains(name)) continue;
+
+    vxStringBase newBase(file.BaseName());
+    newBase.append("_vxmigrate");
+    vxStringBase newName(newBase);
+    const vxStringBase extension = file.Extension();
+    if (!extension.isEmpty()) {
+      newName.append('.');
+      newName.append(extension);
+    }
+    vxStringBase target;
+    vxFileManager::MakePath(target, destinationProfiles, vxStringBase::NullStr, newName);
+    if (access(target.c_str(), F_OK) == 0) continue;
+
+    vxStringBase from;
+    vxFileManager::MakePath(from, sourceProfiles, vxStringBase::NullStr, name);
+    const int copied = vxFileManager::CopyFile(from, target, 0, 1, 0, 0, 0, nullptr, nullptr);
+    Log("Profile copied: ", target.c_str());
+
+    vxStringBase lastWritten(target);
+    if (copied == 0 && copyData) {
+      vxStringBase reportsFrom, reportsTo;
+      vxFileManager::MakePath(reportsFrom, m_sourceDirectory, kReports, name);
+      vxFileManager::MakePath(reportsTo, m_destinationDirectory, kReports, newName);
+      vxFileManager::CopyFile(reportsFrom, reportsTo, 1, 1, 0, 0, 0, nullptr, nullptr);
+      Log("Report folder copied: ", reportsTo.c_str());
+
+      vxStringBase databaseFrom, databaseTo;
+      vxFileManager::MakePath(databaseFrom, m_sourceDirectory, kDatabases, file.BaseName());
+      vxFileManager::MakePath(databaseTo, m_destinationDirectory, kDatabases, newBase);
+      vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
+      Log("Database folder copied: ", databaseTo.c_str());
+      lastWritten = databaseTo;
+    }
+
+    // A profile without its report folders creates its reports on demand unless it says otherwise.
+    // After the folders were copied the last path is the database folder, which does not open as a
+    // profile: the default then stays unset, as the folders carry the reports.
+    vxMappedINIFile copy(lastWritten);
+    if (copy.Open(1) == 0 && copy.GetVal("profile", "ondemandreports").isEmpty()) {
+      copy.SetVal("profile", "ondemandreports", "0");
+      copy.Close(1);
+    }
+  }
+  return 0;
+}

@@ -1,0 +1,69 @@
+// A whole Halden installation converted into an OBX installation: the steps in their order, the
+// source never changed, and the same source giving the same tree every time.
+
+#include <map>
+#include <string>
+#include <vector>
+
+#include "edition/halden_to_obx.h"
+#include "foundation/inifile/ini_file.h"
+#include "tests/edition/edition_fixture.h"
+
+namespace {
+
+using vxtest::EditionRun;
+using vxtest::Snapshot;
+
+std::string Replace(std::string text, const std::string& from, const std::string& to) {
+  for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {
+    text.replace(at, from.size(), to);
+  }
+  return text;
+}
+
+// The run's log with its folders written as <src> and <dst>, so that two runs compare.
+std::vector<std::string> PortableLog(EditionRun& run) {
+  std::vector<std::string> log = run.NewLog();
+  for (std::string& entry : log) {
+    entry = Replace(Replace(entry, run.src(), "<src>"), run.dst(), "<dst>");
+  }
+  return log;
+}
+
+TEST(EditionConversion, NeverChangesTheHaldenInstallation) {
+  EditionRun run;
+  const std::map<std::string, std::string> before = Snapshot(run.src());
+  HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate();
+  EXPECT_EQ(Snapshot(run.src()), before);
+}
+
+TEST(EditionConversion, RunsTheStepsInOrder) {
+  EditionRun run;
+  EXPECT_EQ(HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate(), 0);
+  const std::vector<std::string> log = PortableLog(run);
+  ASSERT_GE(log.size(), 4u);
+  EXPECT_EQ(log.front(), "vxm_log.ini merged with vxm_vxx.ini");
+  EXPECT_EQ(log.back(), "keywords.ini merged");
+  // The profiles see the advanced options merged before them: the Halden "Checkout" content group
+  // joined the OBX one.
+  vxMappedINIFile shop((run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp").c_str());
+  ASSERT_EQ(shop.Open(1), 0);
+  EXPECT_EQ(shop.GetVal("Profile", "includecontentgroups").str(), "4 9 ");
+  EXPECT_EQ(vxtest::ReadFile(run.dst() + "/vxintra.txt"),
+            "10.0.0.0,Office\n192.168.0.0,Warehouse");
+}
+
+TEST(EditionConversion, SameSourceGivesTheSameTree) {
+  EditionRun first;
+  EditionRun second;
+  HaldenToOBXHelper(first.manager()).DoHaldenToOBXMigrate();
+  HaldenToOBXHelper(second.manager()).DoHaldenToOBXMigrate();
+  std::map<std::string, std::string> one = Snapshot(first.dst());
+  std::map<std::string, std::string> two = Snapshot(second.dst());
+  one.erase("vxmigrate.log");
+  two.erase("vxmigrate.log");
+  EXPECT_EQ(one, two);
+  EXPECT_EQ(PortableLog(first), PortableLog(second));
+}
+
+}  // namespace
