@@ -14,6 +14,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_name_set.h"
+#include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
 
@@ -294,7 +295,8 @@ int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
       continue;
     }
     const vxStringBase& source = file.Pathname();
-    if (vxFileManager::CopyFile(source, target, 0, 1, 0, 0, 0, nullptr, nullptr) != 0) {
+    if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
+                                nullptr) != 0) {
       manager_->Log("Error: Unable to open file:   ", source.c_str());
       continue;
     }

@@ -17,6 +17,7 @@
 #include "edition/standard_templates.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -138,7 +139,8 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
 
   vxStringBase standardPath;
   vxFileManager::MakePath(standardPath, destinationFolder_, kServerFolder, kStandardTemplate);
-  vxFileManager::CopyFile(standardPath, targetPath, 0, 1, 0, 0, 0, nullptr, nullptr);
+  vxFileManager::CopyFile(ResolvedCopySource(standardPath), targetPath, 0, 1, 0, 0, 0, nullptr,
+                          nullptr);
   destinationTemplate_.SetFilename(targetPath);
   if (destinationTemplate_.Open(1) != 0) {
     sourceTemplate_.Close(0);

@@ -9,6 +9,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/internal/exclusion_name_set.h"
+#include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
 
@@ -73,7 +74,8 @@ int vxMigrationManager::DoCopyOBXProfiles() {
 
     vxStringBase from;
     vxFileManager::MakePath(from, sourceProfiles, vxStringBase::NullStr, name);
-    const int copied = vxFileManager::CopyFile(from, target, 0, 1, 0, 0, 0, nullptr, nullptr);
+    const int copied = vxFileManager::CopyFile(ResolvedCopySource(from), target, 0, 1, 0, 0, 0,
+                                               nullptr, nullptr);
     Log("Profile copied: ", target.c_str());
 
     vxStringBase lastWritten(target);

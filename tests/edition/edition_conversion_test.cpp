@@ -1,6 +1,9 @@
 // A whole Halden installation converted into an OBX installation: the steps in their order, the
 // source never changed, and the same source giving the same tree every time.
 
+#include <unistd.h>
+
+#include <cstdio>
 #include <map>
 #include <string>
 #include <vector>
@@ -30,11 +33,25 @@ std::vector<std::string> PortableLog(EditionRun& run) {
   return log;
 }
 
+// Also when a profile, or the OBX standard template, is a symbolic link: the converted copies are
+// files of their own and nothing is written through a link.
 TEST(EditionConversion, NeverChangesTheHaldenInstallation) {
   EditionRun run;
+  vxtest::WriteFile(run.src() + "/shared/mirror.conf", "[Profile]\nLogFilePath=file:///var/log/m\n");
+  ASSERT_EQ(symlink((run.src() + "/shared/mirror.conf").c_str(),
+                    (run.src() + "/vxm_log/datfiles/mirror.wlp").c_str()), 0);
+  const std::string standard = run.dst() + "/standard/CompleteSummary.wct";
+  vxtest::WriteFile(standard, vxtest::StandardTemplate());
+  std::remove((run.dst() + "/vxm_vxx/CompleteSummary.wct").c_str());
+  ASSERT_EQ(symlink(standard.c_str(), (run.dst() + "/vxm_vxx/CompleteSummary.wct").c_str()), 0);
   const std::map<std::string, std::string> before = Snapshot(run.src());
+
   HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate();
   EXPECT_EQ(Snapshot(run.src()), before);
+  EXPECT_EQ(vxtest::ReadFile(standard), vxtest::StandardTemplate());
+  vxMappedINIFile mirror((run.dst() + "/vxm_vxx/datfiles/profiles/mirror_vxmigrate.wlp").c_str());
+  ASSERT_EQ(mirror.Open(1), 0);
+  EXPECT_EQ(mirror.GetVal("Profile", "LogFilePath").str(), "/var/log/m");
 }
 
 TEST(EditionConversion, RunsTheStepsInOrder) {

@@ -1,0 +1,27 @@
+// Where a copy should be read from so that the copy is a file of its own. The file layer copies a
+// symbolic link as a link; a settings file copied that way and then rewritten would be rewritten
+// through the link, in the installation it points into.
+
+#ifndef VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
+#define VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
+
+#include <sys/stat.h>
+
+#include <climits>
+#include <cstdlib>
+
+#include "foundation/string/string_base.h"
+
+// The file a symbolic link at path leads to; path itself when it is no link or the link leads
+// nowhere (the copy then fails or copies the dangling link, and nothing is written through it).
+inline vxStringBase ResolvedCopySource(const vxStringBase& path) {
+  struct stat st;
+  if (lstat(path.c_str(), &st) != 0 || !S_ISLNK(st.st_mode)) return path;
+  char* resolved = realpath(path.c_str(), nullptr);
+  if (resolved == nullptr) return path;
+  vxStringBase result(resolved);
+  free(resolved);
+  return result;
+}
+
+#endif  // VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
