@@ -18,7 +18,9 @@ bool DecodePreviousGeneration(const char* text, char* value) {
 
   // The first four bytes carry nothing of the value; it ends at its first zero byte.
   int n = 0;
-  for (int i = kValueStart; i < kBytes && bytes[i] != 0; ++i) value[n++] = static_cast<char>(bytes[i]);
+  for (int i = kValueStart; i < kBytes && bytes[i] != 0; ++i) {
+    value[n++] = static_cast<char>(bytes[i]);
+  }
   value[n] = '\0';
   return true;
 }

@@ -47,8 +47,10 @@ void CopyPlainValue(const char* input, std::size_t inputLength, unsigned char* o
 
 int VXUI_Encrypt(unsigned char* data, unsigned long length, char* output) {
   if (output == nullptr) return 0;
-  output[0] = '\0';
-  if (length == 0) return 1;
+  if (length == 0) {
+    output[0] = '\0';
+    return 1;
+  }
   if (data == nullptr) return 0;
   char key[sizeof(kFixedKeyText)];
   GetProtectedValueKey(key);

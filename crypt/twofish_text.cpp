@@ -3,6 +3,8 @@
 // upper-case digits. The reader trusts nothing in its input: every count is checked against the
 // bytes actually decrypted before anything is copied.
 
+#include "crypt/twofish_text.h"
+
 #include <climits>
 #include <cstdint>
 #include <cstdlib>
@@ -11,7 +13,6 @@
 #include "crypt/hex_digits.h"
 #include "crypt/protected_value.h"
 #include "crypt/twofish_instances.h"
-#include "crypt/twofish_text.h"
 
 namespace vxcrypt {
 
