@@ -19,7 +19,6 @@ namespace {
 
 // Offsets into the text are 32-bit.
 constexpr size_t kMaxFileSize = UINT32_MAX - 1;
-constexpr size_t kWriteChunk = 1 << 20;
 constexpr size_t kMaxTempBase = 200;
 
 bool WriteAll(int fd, const char* data, size_t size) {
@@ -35,6 +34,8 @@ bool WriteAll(int fd, const char* data, size_t size) {
   return true;
 }
 
+// umask can only be read by setting it; the library runs on one thread, so the moment between the
+// two calls is harmless.
 mode_t CurrentUmask() {
   mode_t mask = umask(0);
   umask(mask);
@@ -148,29 +149,17 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
   fd_ = mkostemp(name.data(), O_CLOEXEC);
   if (fd_ < 0) return false;
   tempPath_ = name.data();
-  buffer_.reserve(kWriteChunk);
   return true;
-}
-
-bool AtomicFileWriter::Flush() {
-  if (!failed_ && !buffer_.empty() && !WriteAll(fd_, buffer_.data(), buffer_.size())) failed_ = true;
-  buffer_.clear();
-  return !failed_;
 }
 
 bool AtomicFileWriter::Append(std::string_view data) {
   if (failed_ || fd_ < 0) return false;
-  if (buffer_.size() + data.size() > kWriteChunk && !Flush()) return false;
-  if (data.size() >= kWriteChunk) {
-    if (!WriteAll(fd_, data.data(), data.size())) failed_ = true;
-    return !failed_;
-  }
-  buffer_.append(data);
-  return true;
+  if (!WriteAll(fd_, data.data(), data.size())) failed_ = true;
+  return !failed_;
 }
 
 bool AtomicFileWriter::Commit(bool flushToDisk) {
-  if (fd_ < 0 || !Flush()) {
+  if (fd_ < 0 || failed_) {
     Abandon();
     return false;
   }
