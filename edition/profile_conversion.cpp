@@ -13,7 +13,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/string/tokenizer.h"
-#include "migrate/internal/exclusion_name_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
@@ -82,9 +82,12 @@ class AdvancedOptionIds {
   vxStringBase ids_[kAllProfilesKeyCount];
 };
 
-// "file:///var/log/a.log" -> "/var/log/a.log": the OBX edition reads plain paths.
+// "file:///var/log/a.log" -> "/var/log/a.log": the OBX edition reads plain paths. The scheme and
+// the URL's first eight characters go; when they end in the path's own leading slash ("file:///")
+// that slash stays, so that the path remains absolute.
 void StripFileScheme(vxStringBase& path) {
-  if (path.length() > 8 && path.beginsWith("file:")) path = path.subString(8, vxStringBase::BadIndex);
+  if (path.length() <= 8 || !path.beginsWith("file:")) return;
+  path = path.subString(path.beginsWith("file:///") ? 7 : 8, vxStringBase::BadIndex);
 }
 
 // Sections written "[[Filter1]]" in the Halden edition are "[Filter1]" in the OBX edition.
@@ -278,8 +281,7 @@ int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
   vxStringBase exclusions;
   manager_->MakeFullExclusionList(exclusions, manager_->GetCmdLineParser()->GetValue("PFLog"),
                                   kProfileFolder, "wlp", GetSampleFileList("halsuite", "wlp"));
-  const vxExclusionNameSet excluded(exclusions, manager_->IsInPlaceMigrate(),
-                                    vxStringBase::NullStr);
+  const vxExclusionIndex excluded(*manager_, exclusions, vxStringBase::NullStr, 0);
   AdvancedOptionIds ids(manager_);
 
   for (const vxFileInfo& entry : profiles) {

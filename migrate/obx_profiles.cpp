@@ -8,7 +8,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_name_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
@@ -52,7 +52,7 @@ int vxMigrationManager::DoCopyOBXProfiles() {
   vxStringBase exclusions;
   MakeFullExclusionList(exclusions, m_cmdLineParser->GetValue("PFLog"), kProfiles, "wlp",
                         GetSampleFileList("obx", "wlp"));
-  const vxExclusionNameSet excluded(exclusions, IsInPlaceMigrate(), vxStringBase::NullStr);
+  const vxExclusionIndex excluded(*this, exclusions, vxStringBase::NullStr, 0);
   const bool copyData = CopiesProfileDataFolders();
 
   for (const vxFileInfo& entry : profiles) {

@@ -63,9 +63,9 @@ TEST(EditionConversion, RunsTheStepsInOrder) {
   EXPECT_EQ(log.back(), "keywords.ini merged");
   // The profiles see the advanced options merged before them: the Halden "Checkout" content group
   // joined the OBX one.
-  vxMappedINIFile shop((run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp").c_str());
-  ASSERT_EQ(shop.Open(1), 0);
-  EXPECT_EQ(shop.GetVal("Profile", "includecontentgroups").str(), "4 9 ");
+  const std::string shop =
+      vxtest::ReadFile(run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp");
+  EXPECT_NE(shop.find("\nincludecontentgroups=4 9 \n"), std::string::npos) << shop;
   EXPECT_EQ(vxtest::ReadFile(run.dst() + "/vxintra.txt"),
             "10.0.0.0,Office\n192.168.0.0,Warehouse");
 }

@@ -5,7 +5,6 @@
 #include <vector>
 
 #include "edition/halden_to_obx.h"
-#include "foundation/inifile/ini_file.h"
 #include "tests/edition/edition_fixture.h"
 
 namespace {
@@ -28,10 +27,8 @@ TEST(EditionLogSettings, MergesAndConvertsIntoServerSettings) {
 }
 
 struct KeyCase {
-  const char* halden;       // the [Defaults] and [cookie] lines of the Halden file
-  const char* section;
-  const char* key;
-  const char* expected;     // "<absent>" when the key must not be written
+  const char* halden;  // the Halden file
+  const char* line;    // a line the server settings must hold; "!key" when no line may set key
 };
 
 class EditionLogSettingsKeys : public testing::TestWithParam<KeyCase> {};
@@ -41,31 +38,31 @@ TEST_P(EditionLogSettingsKeys, ConvertsOneKey) {
   WriteFile(run.src() + "/vxm_log/vxm_log.ini", GetParam().halden);
   WriteFile(run.dst() + "/vxm_vxx/vxm_vxx.ini", "[defaults]\nDownloadTypes={exe,0}\n");
   HaldenToOBXHelper(run.manager()).DoVXMLogINIMigrate();
-  vxMappedINIFile result((run.dst() + "/vxm_vxx/vxm_vxx.ini").c_str());
-  ASSERT_EQ(result.Open(1), 0);
-  vxStringBase value;
-  const bool found = result.GetVal(GetParam().section, GetParam().key, value) == 0;
-  EXPECT_EQ(found ? value.str() : std::string("<absent>"), GetParam().expected);
+  const std::string settings = "\n" + ReadFile(run.dst() + "/vxm_vxx/vxm_vxx.ini");
+  const std::string line = GetParam().line;
+  if (line[0] == '!') {
+    EXPECT_EQ(settings.find("\n" + line.substr(1) + "="), std::string::npos) << settings;
+  } else {
+    EXPECT_NE(settings.find("\n" + line + "\n"), std::string::npos) << settings;
+  }
 }
 
 INSTANTIATE_TEST_SUITE_P(
     Cases, EditionLogSettingsKeys,
     testing::Values(
-        KeyCase{"[Defaults]\nDownloadTypes={exe,1} zip\n", "defaults", "DownloadTypes",
-                "{exe,1} {zip,0} "},
-        KeyCase{"[Defaults]\nDownloadTypes=\n", "defaults", "DownloadTypes", "{exe,0}"},
-        KeyCase{"[Defaults]\nTitleCacheLifespan=86399\n", "defaults", "TitleCacheLifespan", "0"},
-        KeyCase{"[Defaults]\nTitleCacheLifespan=259200\n", "defaults", "TitleCacheLifespan", "3"},
-        KeyCase{"[Defaults]\nMaxTopCount=1\n", "defaults", "TitleCacheLifespan", "0"},
-        KeyCase{"[Defaults]\nTitleCacheLifespan=soon\n", "defaults", "TitleCacheLifespan", "0"},
-        KeyCase{"[cookie]\nvantixplugin=0\n", "cookie", "validatetype", "1"},
-        KeyCase{"[cookie]\nvantixplugin=yes\n", "cookie", "validatetype", "1"},
-        KeyCase{"[cookie]\nvantixplugin=1\n", "cookie", "validatetype", "0"},
-        KeyCase{"[cookie]\nCookieString=x\n", "cookie", "validatetype", "<absent>"},
-        KeyCase{"[Defaults]\nUseGlobalSubProfileFilters=1\n", "Defaults", "useglobalquerystrings",
-                "<absent>"},
-        KeyCase{"[Defaults]\nUseGlobalSubProfileFilters=0\n", "Defaults",
-                "useglobalpathsanalysisprofiles", "0"}));
+        KeyCase{"[Defaults]\nDownloadTypes={exe,1} zip\n", "DownloadTypes={exe,1} {zip,0} "},
+        KeyCase{"[Defaults]\nDownloadTypes=\n", "DownloadTypes={exe,0}"},
+        KeyCase{"[Defaults]\nDocumentTypes=htm\n", "DocumentTypes={htm,0} "},
+        KeyCase{"[Defaults]\nTitleCacheLifespan=86399\n", "TitleCacheLifespan=0"},
+        KeyCase{"[Defaults]\nTitleCacheLifespan=259200\n", "TitleCacheLifespan=3"},
+        KeyCase{"[Defaults]\nMaxTopCount=1\n", "TitleCacheLifespan=0"},
+        KeyCase{"[Defaults]\nTitleCacheLifespan=soon\n", "TitleCacheLifespan=0"},
+        KeyCase{"[cookie]\nvantixplugin=0\n", "validatetype=1"},
+        KeyCase{"[cookie]\nvantixplugin=yes\n", "validatetype=1"},
+        KeyCase{"[cookie]\nvantixplugin=1\n", "validatetype=0"},
+        KeyCase{"[cookie]\nCookieString=x\n", "!validatetype"},
+        KeyCase{"[Defaults]\nUseGlobalSubProfileFilters=1\n", "!useglobalquerystrings"},
+        KeyCase{"[Defaults]\nUseGlobalSubProfileFilters=0\n", "useglobalpathsanalysisprofiles=0"}));
 
 TEST(EditionLogSettings, MissingHaldenFileLeavesServerSettingsUntouched) {
   EditionRun run;

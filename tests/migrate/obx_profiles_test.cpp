@@ -10,7 +10,6 @@
 #include <vector>
 
 #include "migrate/driver_fixture.h"
-#include "migrate/internal/exclusion_name_set.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
 #include "support/test_files.h"
@@ -151,31 +150,6 @@ TEST(ObxProfiles, RefusesWithoutSettingsAndInPlace) {
                                       "-V2:3.5"});
   EXPECT_EQ(inPlace->DoCopyOBXProfiles(), 0);
   EXPECT_FALSE(vxtest::FileExists(root.Path("vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp")));
-}
-
-// The hash set must answer exactly as the manager's own list test.
-TEST(ExclusionNameSet, AnswersAsIsExcludeFile) {
-  vxtest::TempDir root;
-  vxtest::MakeDirs(root.Path("a"));
-  vxtest::MakeDirs(root.Path("b"));
-  const char* const lists[] = {"", "a.wlp", " a.wlp , B.WLP,", "x.ini,a.wlp", ",,c.wlp", "a.ini.wlp"};
-  const char* const files[] = {"a.wlp", "b.wlp", "A.WLP", "c.wlp", "x.ini", "x.", "x.bak", "",
-                               "a.ini.", "a.ini.wlp"};
-  for (bool inPlace : {false, true}) {
-    auto manager = vxtest::MakeManager({root.Path("vxmigrate"), "-D1:" + root.Path("a"),
-                                        "-D2:" + root.Path(inPlace ? "a" : "b"), "-P1:obx",
-                                        "-P2:obx", "-V1:3.0", "-V2:3.5"});
-    for (const char* extension : {"", "bak"}) {
-      for (const char* list : lists) {
-        const vxExclusionNameSet set(list, inPlace, extension);
-        for (const char* file : files) {
-          EXPECT_EQ(set.Contains(file),
-                    manager->IsExcludeFile(file, list, extension, 0) != 0)
-              << "list '" << list << "' file '" << file << "' in place " << inPlace;
-        }
-      }
-    }
-  }
 }
 
 }  // namespace
