@@ -1,73 +1,83 @@
-// A whole Halden installation converted into an OBX installation: the steps in their order, the
-// source never changed, and the same source giving the same tree every time.
+// A whole Halden installation converted into an OBX installation, compared with
+// tests/edition/data/expected: every file the conversion writes, byte for byte, and the log. The
+// Halden installation is never changed, the same source gives the same tree every time, and a
+// second run over the same destination converts nothing.
 
 #include <unistd.h>
 
 #include <cstdio>
+#include <iterator>
 #include <map>
 #include <string>
 #include <vector>
 
 #include "edition/halden_to_obx.h"
-#include "foundation/inifile/ini_file.h"
 #include "tests/edition/edition_fixture.h"
 
 namespace {
 
 using vxtest::EditionRun;
+using vxtest::ReadFile;
 using vxtest::Snapshot;
 
-std::string Replace(std::string text, const std::string& from, const std::string& to) {
-  for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {
-    text.replace(at, from.size(), to);
+// The files a conversion writes below a destination: the "_vxmigrate" ones and the settings.
+std::map<std::string, std::string> Converted(const std::string& dst) {
+  std::map<std::string, std::string> files = Snapshot(dst);
+  for (auto file = files.begin(); file != files.end();) {
+    const bool ours = file->first.find("_vxmigrate") != std::string::npos ||
+                      file->first == "vxm_vxx/vxm_vxx.ini";
+    file = ours ? std::next(file) : files.erase(file);
+  }
+  return files;
+}
+
+// The run's log entries, one a line, with its folders written as <src> and <dst>.
+std::string PortableLog(EditionRun& run) {
+  std::string text;
+  for (const std::string& entry : run.NewLog()) text += entry + "\n";
+  for (const auto& [folder, mark] : {std::make_pair(run.src(), "<src>"),
+                                     std::make_pair(run.dst(), "<dst>")}) {
+    for (size_t at; (at = text.find(folder)) != std::string::npos;) {
+      text.replace(at, folder.size(), mark);
+    }
   }
   return text;
 }
 
-// The run's log with its folders written as <src> and <dst>, so that two runs compare.
-std::vector<std::string> PortableLog(EditionRun& run) {
-  std::vector<std::string> log = run.NewLog();
-  for (std::string& entry : log) {
-    entry = Replace(Replace(entry, run.src(), "<src>"), run.dst(), "<dst>");
-  }
-  return log;
-}
-
-// Also when a profile, or the OBX standard template, is a symbolic link: the converted copies are
-// files of their own and nothing is written through a link.
-TEST(EditionConversion, NeverChangesTheHaldenInstallation) {
+TEST(EditionConversion, WholeInstallation) {
   EditionRun run;
-  vxtest::WriteFile(run.src() + "/shared/mirror.conf", "[Profile]\nLogFilePath=file:///var/log/m\n");
+  // A profile and the OBX standard template that are symbolic links: the converted copies are
+  // files of their own, and nothing is written through a link.
+  vxtest::WriteFile(run.src() + "/shared/mirror.conf", "[Profile]\nLogFilePath=file:///var/m\n");
   ASSERT_EQ(symlink((run.src() + "/shared/mirror.conf").c_str(),
                     (run.src() + "/vxm_log/datfiles/mirror.wlp").c_str()), 0);
-  const std::string standard = run.dst() + "/standard/CompleteSummary.wct";
-  vxtest::WriteFile(standard, vxtest::StandardTemplate());
-  std::remove((run.dst() + "/vxm_vxx/CompleteSummary.wct").c_str());
-  ASSERT_EQ(symlink(standard.c_str(), (run.dst() + "/vxm_vxx/CompleteSummary.wct").c_str()), 0);
-  const std::map<std::string, std::string> before = Snapshot(run.src());
+  const std::string standard = run.dst() + "/vxm_vxx/CompleteSummary.wct";
+  ASSERT_EQ(rename(standard.c_str(), (run.src() + "/shared/standard.wct").c_str()), 0);
+  ASSERT_EQ(symlink((run.src() + "/shared/standard.wct").c_str(), standard.c_str()), 0);
+  const std::map<std::string, std::string> source = Snapshot(run.src());
 
-  HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate();
-  EXPECT_EQ(Snapshot(run.src()), before);
-  EXPECT_EQ(vxtest::ReadFile(standard), vxtest::StandardTemplate());
-  vxMappedINIFile mirror((run.dst() + "/vxm_vxx/datfiles/profiles/mirror_vxmigrate.wlp").c_str());
-  ASSERT_EQ(mirror.Open(1), 0);
-  EXPECT_EQ(mirror.GetVal("Profile", "LogFilePath").str(), "/var/log/m");
-}
-
-TEST(EditionConversion, RunsTheStepsInOrder) {
-  EditionRun run;
   EXPECT_EQ(HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate(), 0);
-  const std::vector<std::string> log = PortableLog(run);
-  ASSERT_GE(log.size(), 4u);
-  EXPECT_EQ(log.front(), "vxm_log.ini merged with vxm_vxx.ini");
-  EXPECT_EQ(log.back(), "keywords.ini merged");
-  // The profiles see the advanced options merged before them: the Halden "Checkout" content group
-  // joined the OBX one.
-  const std::string shop =
-      vxtest::ReadFile(run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp");
-  EXPECT_NE(shop.find("\nincludecontentgroups=4 9 \n"), std::string::npos) << shop;
-  EXPECT_EQ(vxtest::ReadFile(run.dst() + "/vxintra.txt"),
-            "10.0.0.0,Office\n192.168.0.0,Warehouse");
+  EXPECT_EQ(Snapshot(run.src()), source);
+  std::map<std::string, std::string> expected = Snapshot(vxtest::DataPath("expected"));
+  for (auto& [name, text] : expected) text = vxtest::ExpandCredentials(text);
+  const std::string log = expected["vxmigrate.log"];
+  expected.erase("vxmigrate.log");
+  // An unreadable profile is left as the user's copy.
+  expected["vxm_vxx/datfiles/profiles/corrupt_vxmigrate.wlp"] =
+      ReadFile(run.src() + "/vxm_log/datfiles/corrupt.wlp");
+  EXPECT_EQ(Converted(run.dst()), expected);
+  EXPECT_EQ(PortableLog(run), log);
+
+  // A second run finds every target present and leaves it as it is.
+  HaldenToOBXHelper(run.manager()).DoHaldenToOBXMigrate();
+  std::map<std::string, std::string> again = Converted(run.dst());
+  again.erase("vxm_vxx/vxm_vxx.ini");
+  expected.erase("vxm_vxx/vxm_vxx.ini");
+  EXPECT_EQ(again, expected);
+  const std::string secondLog = PortableLog(run);
+  EXPECT_EQ(secondLog.find("conversion: <src>"), std::string::npos) << secondLog;
+  EXPECT_NE(secondLog.find("File exists - no copy made:  <dst>/vxm_vxx/datfiles/profiles/"
+                           "shop_vxmigrate.wlp\n"), std::string::npos) << secondLog;
 }
 
 TEST(EditionConversion, SameSourceGivesTheSameTree) {
@@ -81,6 +91,13 @@ TEST(EditionConversion, SameSourceGivesTheSameTree) {
   two.erase("vxmigrate.log");
   EXPECT_EQ(one, two);
   EXPECT_EQ(PortableLog(first), PortableLog(second));
+}
+
+TEST(EditionConversion, OnlySelectedProfilesTravel) {
+  EditionRun run("3.0", {"-PFLog:shop.wlp"});
+  HaldenToOBXHelper(run.manager()).DoHaldenToOBXProfileFileMigrate();
+  EXPECT_EQ(vxtest::ListTree(run.dst() + "/vxm_vxx/datfiles/profiles"),
+            std::vector<std::string>{"shop_vxmigrate.wlp"});
 }
 
 }  // namespace

@@ -3,7 +3,6 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <memory>
 #include <string>
@@ -20,13 +19,9 @@ using vxtest::ListTree;
 using vxtest::ReadFile;
 using vxtest::WriteFile;
 
-const char kProfiles[] = "/vxm_vxx/datfiles/profiles/";
-
 class ObxRun {
  public:
   explicit ObxRun(const std::string& profilesDir, std::vector<std::string> extra = {}) {
-    vxtest::MakeDirs(src());
-    vxtest::MakeDirs(dst());
     WriteFile(src() + "/vxm_vxx/vxm_vxx.ini", "[defaults]\nprofilesdir=" + profilesDir + "\n");
     WriteFile(dst() + "/vxm_vxx/vxm_vxx.ini", "[defaults]\nprofilesdir=\n");
     std::vector<std::string> args = {root_.Path("bin/vxmigrate"), "-D1:" + src(), "-D2:" + dst(),
@@ -43,15 +38,15 @@ class ObxRun {
     return std::vector<std::string>(all.begin() + mark_, all.end());
   }
 
-  // Two profiles of the user's (one with its report and database folders) and the samples.
-  void WriteProfiles(const std::string& folder) {
-    WriteFile(folder + "/shop.wlp", "[profile]\nName=Shop\n");
-    WriteFile(folder + "/intranet.wlp", "[profile]\nName=Intranet\nondemandreports=1\n");
-    const std::string samples = GetSampleFileList("obx", "wlp");
-    for (size_t at = 0; at < samples.size();) {
-      const size_t comma = std::min(samples.find(',', at), samples.size());
-      WriteFile(folder + "/" + samples.substr(at, comma - at), "[profile]\nName=Sample\n");
-      at = comma + 1;
+  // Two profiles of the user's (one with report and database folders) and the edition's samples.
+  void WriteProfiles() {
+    const std::string folder = src() + "/vxm_vxx/datfiles/profiles/";
+    WriteFile(folder + "shop.wlp", "[profile]\nName=Shop\n");
+    WriteFile(folder + "intranet.wlp", "[profile]\nondemandreports=1\n");
+    std::string samples = std::string(GetSampleFileList("obx", "wlp")) + ",";
+    for (size_t comma; (comma = samples.find(',')) != std::string::npos;) {
+      WriteFile(folder + samples.substr(0, comma), "[profile]\n");
+      samples.erase(0, comma + 1);
     }
     WriteFile(src() + "/vxm_vxx/datfiles/reports/shop.wlp/index.htm", "<html/>");
     WriteFile(src() + "/vxm_vxx/datfiles/databases/shop/visits.db", "data");
@@ -67,38 +62,34 @@ class ObxProfilesFT : public testing::TestWithParam<const char*> {};
 
 TEST_P(ObxProfilesFT, CopiesDataFoldersOnlyWhenAsked) {
   const std::string ft = GetParam();
-  ObxRun run("", ft == "<absent>" ? std::vector<std::string>{}
-                                   : std::vector<std::string>{"-FT:" + ft});
-  run.WriteProfiles(run.src() + "/vxm_vxx/datfiles/profiles");
+  ObxRun run("", ft.empty() ? std::vector<std::string>{} : std::vector<std::string>{"-FT:" + ft});
+  run.WriteProfiles();
   EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 0);
   const std::string to = run.dst() + "/vxm_vxx/datfiles/";
   const bool data = ft != "N";
-  std::vector<std::string> expectedTree;
-  std::vector<std::string> expectedLog = {"Profile copied: " + to + "profiles/intranet_vxmigrate.wlp"};
-  if (data) {
-    expectedTree = {"databases", "databases/shop_vxmigrate", "databases/shop_vxmigrate/visits.db",
-                    "profiles", "profiles/intranet_vxmigrate.wlp", "profiles/shop_vxmigrate.wlp",
-                    "reports", "reports/shop_vxmigrate.wlp", "reports/shop_vxmigrate.wlp/index.htm"};
-    expectedLog.push_back("Report folder copied: " + to + "reports/intranet_vxmigrate.wlp");
-    expectedLog.push_back("Database folder copied: " + to + "databases/intranet_vxmigrate");
-  } else {
-    expectedTree = {"profiles", "profiles/intranet_vxmigrate.wlp", "profiles/shop_vxmigrate.wlp"};
+  std::vector<std::string> log;
+  for (const char* name : {"intranet", "shop"}) {
+    log.push_back("Profile copied: " + to + "profiles/" + name + "_vxmigrate.wlp");
+    if (!data) continue;
+    log.push_back("Report folder copied: " + to + "reports/" + name + "_vxmigrate.wlp");
+    log.push_back("Database folder copied: " + to + "databases/" + name + "_vxmigrate");
   }
-  expectedLog.push_back("Profile copied: " + to + "profiles/shop_vxmigrate.wlp");
+  EXPECT_EQ(run.NewLog(), log);
+  std::vector<std::string> tree = {"profiles", "profiles/intranet_vxmigrate.wlp",
+                                   "profiles/shop_vxmigrate.wlp"};
   if (data) {
-    expectedLog.push_back("Report folder copied: " + to + "reports/shop_vxmigrate.wlp");
-    expectedLog.push_back("Database folder copied: " + to + "databases/shop_vxmigrate");
+    tree = {"databases", "databases/shop_vxmigrate", "databases/shop_vxmigrate/visits.db",
+            tree[0], tree[1], tree[2], "reports", "reports/shop_vxmigrate.wlp",
+            "reports/shop_vxmigrate.wlp/index.htm"};
   }
-  EXPECT_EQ(ListTree(to), expectedTree);
-  EXPECT_EQ(run.NewLog(), expectedLog);
+  EXPECT_EQ(ListTree(to), tree);
   // A profile travelling without its folders makes its reports on demand unless it said otherwise.
   EXPECT_EQ(ReadFile(to + "profiles/shop_vxmigrate.wlp"),
             data ? "[profile]\nName=Shop\n" : "[profile]\nName=Shop\nondemandreports=0\n");
-  EXPECT_EQ(ReadFile(to + "profiles/intranet_vxmigrate.wlp"),
-            "[profile]\nName=Intranet\nondemandreports=1\n");
+  EXPECT_EQ(ReadFile(to + "profiles/intranet_vxmigrate.wlp"), "[profile]\nondemandreports=1\n");
 }
 
-INSTANTIATE_TEST_SUITE_P(Values, ObxProfilesFT, testing::Values("<absent>", "Y", "yes", "N"));
+INSTANTIATE_TEST_SUITE_P(Values, ObxProfilesFT, testing::Values("", "Y", "yes", "N"));
 
 struct FolderCase {
   const char* profilesDir;
@@ -112,7 +103,7 @@ TEST_P(ObxProfilesFolder, AcceptsOnlyFoldersInsideTheInstallation) {
   const std::string folder = *GetParam().folder ? GetParam().folder : "profiles";
   WriteFile(run.src() + "/" + folder + "/p.wlp", "[profile]\nondemandreports=1\n");
   EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 0);
-  EXPECT_EQ(ListTree(run.dst() + kProfiles),
+  EXPECT_EQ(ListTree(run.dst() + "/vxm_vxx/datfiles/profiles"),
             *GetParam().folder ? std::vector<std::string>{"p_vxmigrate.wlp"}
                                : std::vector<std::string>{});
 }
@@ -124,32 +115,28 @@ INSTANTIATE_TEST_SUITE_P(
                     FolderCase{".\\profiles", ""}, FolderCase{"/data/profiles", ""},
                     FolderCase{"../profiles", ""}));
 
-TEST(ObxProfiles, NeverRedoesACopy) {
+// A copy already there is the user's: it is neither redone nor logged. Without either settings
+// file nothing is copied, nor in place.
+TEST(ObxProfiles, LeavesExistingCopiesAndRefusesWithoutSettings) {
   ObxRun run("");
-  run.WriteProfiles(run.src() + "/vxm_vxx/datfiles/profiles");
-  WriteFile(run.dst() + kProfiles + "shop_vxmigrate.wlp", "mine");
+  run.WriteProfiles();
+  const std::string mine = run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp";
+  WriteFile(mine, "mine");
   run.manager()->DoCopyOBXProfiles();
-  EXPECT_EQ(ReadFile(run.dst() + kProfiles + "shop_vxmigrate.wlp"), "mine");
-  for (const std::string& entry : run.NewLog()) {
-    EXPECT_EQ(entry.find("shop_vxmigrate"), std::string::npos) << entry;
-  }
-}
+  EXPECT_EQ(ReadFile(mine), "mine");
+  EXPECT_EQ(run.NewLog().size(), 3u);  // the intranet profile and its two folders
 
-TEST(ObxProfiles, RefusesWithoutSettingsAndInPlace) {
-  ObxRun missing("");
-  std::remove((missing.src() + "/vxm_vxx/vxm_vxx.ini").c_str());
-  EXPECT_EQ(missing.manager()->DoCopyOBXProfiles(), 1);
-  std::remove((missing.dst() + "/vxm_vxx/vxm_vxx.ini").c_str());
-  EXPECT_EQ(missing.manager()->DoCopyOBXProfiles(), 1);
-
-  vxtest::TempDir root;
-  WriteFile(root.Path("vxm_vxx/datfiles/profiles/shop.wlp"), "[profile]\n");
-  WriteFile(root.Path("vxm_vxx/vxm_vxx.ini"), "[defaults]\n");
-  auto inPlace = vxtest::MakeManager({root.Path("vxmigrate"), "-D1:" + root.path(),
-                                      "-D2:" + root.path(), "-P1:obx", "-P2:obx", "-V1:3.0",
+  auto inPlace = vxtest::MakeManager({run.src() + "/vxmigrate", "-D1:" + run.src(),
+                                      "-D2:" + run.src(), "-P1:obx", "-P2:obx", "-V1:3.0",
                                       "-V2:3.5"});
+  const std::vector<std::string> before = ListTree(run.src());
   EXPECT_EQ(inPlace->DoCopyOBXProfiles(), 0);
-  EXPECT_FALSE(vxtest::FileExists(root.Path("vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp")));
+  EXPECT_EQ(ListTree(run.src()), before);
+
+  std::remove((run.src() + "/vxm_vxx/vxm_vxx.ini").c_str());
+  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 1);
+  std::remove((run.dst() + "/vxm_vxx/vxm_vxx.ini").c_str());
+  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 1);
 }
 
 }  // namespace

@@ -1,0 +1,2 @@
+[SaveAs]
+SaveReportAs=plain.txt
