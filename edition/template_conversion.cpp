@@ -176,6 +176,9 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
   destinationTemplate_.SetVal("content", "helpcards", buffer);
 
   ConvertReportSections(sourcePath, buffer);
+  // The cursors point into the two files' lines, which closing frees.
+  sourceSection_ = nullptr;
+  destinationSection_ = nullptr;
 
   sourceTemplate_.Close(0);
   if (destinationTemplate_.Close(1) != 0) {
