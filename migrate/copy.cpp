@@ -3,6 +3,7 @@
 // run (source folder equal to destination folder) every operation does nothing and returns 0.
 // A file that cannot be copied costs one "Error: " line and the walk goes on with the rest.
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <string>
@@ -23,18 +24,32 @@ const char kFileCopiedTree[] = "File copied:  ";          // CopyAllFilesOfType:
 const char kFileExists[] = "File exists - no copy made:  ";
 const char kFilesCopiedFromFolder[] = "Files copied from folder:  ";
 const char kUnableToReadFolder[] = "Error: Unable to read folder:  ";
-const char kUnableToReadFile[] = "Error: Unable to read file:  ";
 
-// A pattern copy is one call that reports only success or failure. When it fails, name the
-// matching files that could not even be read, so the customer learns which ones stayed behind.
-void ReportUnreadableFiles(vxMigrationManager& manager, const vxStringBase& folder,
-                           const char* pattern) {
+// A pattern copy reports only success or failure for the whole set. After a failure, name each
+// matching file that did not arrive, so the customer learns which ones stayed behind.
+void ReportFilesNotCopied(vxMigrationManager& manager, const vxStringBase& sourceFolder,
+                          const vxStringBase& extension, const vxStringBase& destinationFolder) {
+  vxStringBase pattern("*.");
+  pattern.append(extension);
   vxFileInfoList files;
-  vxFileManager::GetFileList(folder, pattern, files, 0);
+  vxFileManager::GetFileList(sourceFolder, pattern.c_str(), files, 0);
+  vxStringBase destination;
   for (const vxFileInfo& file : files) {
-    const vxStringBase& path = file.GetFilename().Pathname();
-    if (file.IsRegular() && access(path.c_str(), R_OK) != 0) manager.Log(kUnableToReadFile, path.c_str());
+    if (!file.IsRegular() && !file.IsSymlink()) continue;  // pipes and devices are not copied
+    vxFileManager::MakePath(destination, destinationFolder, file.GetFilename().Filename(), 1);
+    if (!vxFileManager::Exists(destination)) {
+      manager.Log(vxMsgUnableToCopyFile, file.GetFilename().Pathname().c_str());
+    }
   }
+}
+
+// A newer-only copy keeps a destination that is not older than the source; that is no failure.
+bool KeptAsNewer(const vxStringBase& source, const vxStringBase& destination) {
+  struct stat from;
+  struct stat to;
+  if (lstat(source.c_str(), &from) != 0 || lstat(destination.c_str(), &to) != 0) return false;
+  return from.st_mtim.tv_sec < to.st_mtim.tv_sec ||
+         (from.st_mtim.tv_sec == to.st_mtim.tv_sec && from.st_mtim.tv_nsec <= to.st_mtim.tv_nsec);
 }
 
 // The next non-empty piece of a list, blanks around it dropped: "ini, dat," names ini and dat.
@@ -75,11 +90,7 @@ int vxMigrationManager::CopyFilesOfType(const char* extension, unsigned int copy
   source.append(extension);
   const int result = vxFileManager::CopyFile(vxFilename(source), vxFilename(m_destinationDirectory),
                                              1, copyOption, 0, 0, 0, nullptr, nullptr);
-  if (result != 0) {
-    vxStringBase pattern("*.");
-    pattern.append(extension);
-    ReportUnreadableFiles(*this, m_sourceDirectory, pattern.c_str());
-  }
+  if (result != 0) ReportFilesNotCopied(*this, m_sourceDirectory, extension, m_destinationDirectory);
   return result;
 }
 
@@ -106,7 +117,8 @@ int vxMigrationManager::CopyFiles(const vxStringBase& fileNames, unsigned int co
     vxFileManager::MakePath(destination, m_destinationDirectory, vxStringBase::NullStr, name);
     if (vxFileManager::CopyFile(source, destination, 0, 1, copyOption, 0, 0, nullptr, nullptr) == 0) {
       Log(kFileCopied, source.c_str());
-    } else if (vxFileManager::Exists(source)) {
+    } else if (vxFileManager::Exists(source) &&
+               !(copyOption != 0 && KeptAsNewer(source, destination))) {
       Log(vxMsgUnableToCopyFile, source.c_str());
     }
   }
@@ -160,10 +172,6 @@ int vxMigrationManager::CopyFilesInRelativeFolder(const vxStringBase& relativeFo
   const int result =
       vxFileManager::CopyFile(source, destination, 1, 1, copyOption, 0, 0, nullptr, nullptr);
   Log(kFilesCopiedFromFolder, source.c_str());
-  if (result != 0) {
-    vxStringBase pattern("*.");
-    pattern.append(extension);
-    ReportUnreadableFiles(*this, folder, pattern.c_str());
-  }
+  if (result != 0) ReportFilesNotCopied(*this, folder, extension, destination);
   return result;
 }

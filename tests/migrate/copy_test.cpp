@@ -193,6 +193,29 @@ TEST_F(ToolkitTest, CopyFilesInRelativeFolderCopiesOneFolderAndLogsIt) {
   EXPECT_FALSE(FileExists(D("templates/deeper")));
 }
 
+// A pattern copy answers for the whole set; the files that did not arrive are named one by one.
+TEST_F(ToolkitTest, PatternCopiesNameTheFilesThatStayedBehind) {
+  if (RunningAsRoot()) GTEST_SKIP() << "root reads every file";
+  WriteFile(S("templates/a.mss"), "a");
+  WriteFile(S("templates/secret.mss"), "secret");
+  WriteFile(S("top.mss"), "top");
+  WriteFile(S("hidden.mss"), "hidden");
+  WriteFile(D("kept.mss"), "kept");
+  WriteFile(S("kept.mss"), "old kept");
+  chmod(S("templates/secret.mss").c_str(), 0);
+  chmod(S("hidden.mss").c_str(), 0);
+  StartRun();
+  EXPECT_EQ(1, manager_->CopyFilesInRelativeFolder("templates", "mss", 0));
+  EXPECT_EQ(1, manager_->CopyFilesOfType("mss", 0));
+  EXPECT_EQ((Entries{"Files copied from folder:  " + S("templates/*.mss"),
+                     "Error: Unable to copy file:  " + S("templates/secret.mss"),
+                     "Error: Unable to copy file:  " + S("hidden.mss")}),
+            NewLogEntries());
+  EXPECT_EQ("a", ReadFile(D("templates/a.mss")));
+  EXPECT_EQ("top", ReadFile(D("top.mss")));
+  EXPECT_EQ("kept", ReadFile(D("kept.mss")));
+}
+
 // In place, the source is the destination: every operation does nothing, whatever it is given.
 TEST_F(ToolkitTest, InPlaceRunsCopyAndLogNothing) {
   WriteFile(S("a.ini"), "a");
