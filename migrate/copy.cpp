@@ -144,11 +144,12 @@ int vxMigrationManager::CopyAllFilesOfType(const vxStringBase& extension,
       vxFileManager::MakePath(source, m_sourceDirectory, folder, name);
       vxFileManager::MakePath(destination, m_destinationDirectory, folder, name);
       if (excluded.Contains(source)) continue;
-      // Anything at the destination, a dangling link included, belongs to the new installation.
-      if (vxFileManager::Exists(destination)) {
-        Log(kFileExists, source.c_str());
-      } else if (vxFileManager::CopyFile(source, destination, 0, 0, 0, 0, 0, nullptr, nullptr) == 0) {
+      // The copy never replaces anything at the destination, a dangling link included, so it is
+      // asked first and the destination looked at only when it refused: one lookup less per file.
+      if (vxFileManager::CopyFile(source, destination, 0, 0, 0, 0, 0, nullptr, nullptr) == 0) {
         Log(kFileCopiedTree, source.c_str());
+      } else if (vxFileManager::Exists(destination)) {
+        Log(kFileExists, source.c_str());
       } else {
         Log(vxMsgUnableToCopyFile, source.c_str());
       }
