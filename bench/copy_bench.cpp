@@ -4,7 +4,8 @@
 // destination is deleted between runs, since the file system then spends its time skipping the
 // inodes it just freed, which would bias whichever copy came after a delete.
 // The tree lives in $VXM_BENCH_DIR (default $TMPDIR or /tmp) and is removed afterwards;
-// VXM_BENCH_FILES and VXM_BENCH_BYTES shrink it for a quick check.
+// VXM_BENCH_FILES and VXM_BENCH_BYTES shrink it for a quick check; VXM_BENCH_ROUNDS (default 2)
+// sets how many times the three copies take turns.
 
 #include <benchmark/benchmark.h>
 #include <fcntl.h>
@@ -132,14 +133,6 @@ void BM_FileManagerTreeCopy(benchmark::State& state) {
 
 }  // namespace
 
-// Round 1 of each copy, then round 2: registration order is run order.
-BENCHMARK(BM_CpA)->Arg(1)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_CopyAllFilesOfType)->Arg(1)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_FileManagerTreeCopy)->Arg(1)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_CpA)->Arg(2)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_CopyAllFilesOfType)->Arg(2)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(BM_FileManagerTreeCopy)->Arg(2)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
-
 int main(int argc, char** argv) {
   const char* base = getenv("VXM_BENCH_DIR");
   if (base == nullptr || *base == '\0') base = getenv("TMPDIR");
@@ -155,6 +148,15 @@ int main(int argc, char** argv) {
   GenerateTree(g_root + "/src", files, bytes);
   Run("sync");
 
+  // Each round runs the three copies in turn; registration order is run order.
+  const int64_t rounds = static_cast<int64_t>(EnvNumber("VXM_BENCH_ROUNDS", 2));
+  for (int64_t round = 1; round <= rounds; ++round) {
+    for (auto* b : {benchmark::RegisterBenchmark("BM_CpA", BM_CpA),
+                    benchmark::RegisterBenchmark("BM_CopyAllFilesOfType", BM_CopyAllFilesOfType),
+                    benchmark::RegisterBenchmark("BM_FileManagerTreeCopy", BM_FileManagerTreeCopy)}) {
+      b->Arg(round)->Iterations(1)->UseManualTime()->Unit(benchmark::kMillisecond);
+    }
+  }
   benchmark::Initialize(&argc, argv);
   benchmark::RunSpecifiedBenchmarks();
   benchmark::Shutdown();
