@@ -106,6 +106,10 @@ class CategoriesMerge {
 
   void Run() {
     int64_t categoryCount = ReadCount(destination_, kMainSection, kCategoryCountKey);
+    // A new file starts with its list of categories, as the product writes it.
+    if (!destination_.HasSection(kMainSection)) {
+      WriteCount(destination_, kMainSection, kCategoryCountKey, categoryCount);
+    }
     std::unordered_set<std::string> categoryNames;
     for (auto& entry : ReadNumbered(destination_, kMainSection, kCategoryKey, categoryCount)) {
       categoryNames.insert(entry.second.str());
@@ -202,6 +206,8 @@ void vxMigrationManager::MergeCategoriesINIFile(const char* profileFolder, const
                   keepNames)
       .Run();
   source.Close(0);
+  // The entries are worth keeping even when no profile came along to create the folder.
+  vxFileManager::CreateDirectory(destinationFolder, nullptr);
   if (destination.Close(1) != 0) {
     Log("Error: categories.ini could not be written: ", destinationPath.c_str());
     return;

@@ -152,8 +152,10 @@ TEST(DoCopyLogProfiles, LeavesAProfileItCannotRewriteAsCopiedAndGoesOn) {
   Installations run;
   const std::string binary("[Profile]\nLogFilePassword=x\n\0\x01\x02", 31);
   WriteFile(run.Src("profiles/a_binary.wlp"), binary);
-  const std::string tooLong = "[Profile]\nHomePageName=a/b.htm\nLogFilePassword=" +
-                              LegacyEncoded(std::string(600, 'p')) + "\n";
+  const std::string longPassword = LegacyEncoded(std::string(600, 'x'));
+  ASSERT_EQ(600u, longPassword.size());  // no pad byte ends the encoded text early
+  const std::string tooLong =
+      "[Profile]\nHomePageName=a/b.htm\nLogFilePassword=" + longPassword + "\n";
   WriteFile(run.Src("profiles/b_long.wlp"), tooLong);
   WriteFile(run.Src("profiles/c_good.wlp"), "[Profile]\nLogFilePassword=" + LegacyEncoded("pw") + "\n");
 
