@@ -29,10 +29,11 @@ TEST(DoCopyAlertProfiles, CopiesAllButSamplesAndRedirectsTheAlertSystemsListFile
             "l3=lert02.txt\r\n"
             "l4=LERT03.lst\r\n"
             "l5=/unix/style/lert04.lst\r\n"
-            "l6=D:\\lert\r\n"
+            "l6=D:\\lert07_vxmigrate.lst\r\n"
             "l8=C:\\lert09.lst\r\n"
             "[Alert_Email_List]\r\n"
             "l1=C:\\lert05.lst\r\n");
+  WriteFile(run.Dst("datfiles/alerts/day_vxmigrate.alp"), "[Alert]\nName=day, migrated before\n");
 
   EXPECT_EQ(0, run.manager().DoCopyAlertProfiles("datfiles/alerts", "*.alp", "alp", "demo.alp"));
 
@@ -48,29 +49,15 @@ TEST(DoCopyAlertProfiles, CopiesAllButSamplesAndRedirectsTheAlertSystemsListFile
             "l3=lert02_vxmigrate.txt\r\n"
             "l4=LERT03.lst\r\n"
             "l5=/unix/style/lert04.lst\r\n"
-            "l6=lert_vxmigrate.\r\n"
+            "l6=lert07_vxmigrate.lst\r\n"
             "l8=C:\\lert09.lst\r\n"
             "[Alert_Email_List]\r\n"
             "l1=C:\\lert05.lst\r\n",
             ReadFile(run.Dst("datfiles/alerts/night_vxmigrate.alp")));
-  EXPECT_EQ((Entries{"File copied:  " + run.Dst("datfiles/alerts/day_vxmigrate.alp"),
+  EXPECT_EQ("[Alert]\nName=day, migrated before\n",
+            ReadFile(run.Dst("datfiles/alerts/day_vxmigrate.alp")));
+  EXPECT_EQ((Entries{"File exists - no copy made:  " + run.Dst("datfiles/alerts/day_vxmigrate.alp"),
                      "File copied:  " + run.Dst("datfiles/alerts/night_vxmigrate.alp")}),
-            run.RunLog());
-}
-
-TEST(DoCopyAlertProfiles, LeavesAnExistingMarkedCopyAndMarkedListNamesAlone) {
-  Installations run;
-  WriteFile(run.Src("alerts/a.alp"), "[Alert_Pager_List]\nl0=C:\\x\\lert01_vxmigrate.lst\n");
-  WriteFile(run.Src("alerts/b.alp"), "[Alert]\nName=b, old\n");
-  WriteFile(run.Dst("alerts/b_vxmigrate.alp"), "[Alert]\nName=b, migrated before\n");
-
-  run.manager().DoCopyAlertProfiles("alerts", "*.alp", "alp", "");
-
-  EXPECT_EQ("[Alert_Pager_List]\nl0=lert01_vxmigrate.lst\n",
-            ReadFile(run.Dst("alerts/a_vxmigrate.alp")));
-  EXPECT_EQ("[Alert]\nName=b, migrated before\n", ReadFile(run.Dst("alerts/b_vxmigrate.alp")));
-  EXPECT_EQ((Entries{"File copied:  " + run.Dst("alerts/a_vxmigrate.alp"),
-                     "File exists - no copy made:  " + run.Dst("alerts/b_vxmigrate.alp")}),
             run.RunLog());
 }
 
@@ -86,9 +73,10 @@ TEST(DoCopyAlertProfiles, MergesTheConsoleCategoriesWithTheSelectedProfilesUnren
 
   run.manager().DoCopyAlertProfiles("datfiles/alerts", "*.alp", "alp", "");
 
-  std::string categories = ReadFile(run.Dst("console_datfiles/alerts/categories.ini"));
-  EXPECT_NE(std::string::npos, categories.find("=" + run.Dst("console_datfiles/alerts/night.alp")));
-  EXPECT_EQ(std::string::npos, categories.find("day"));
+  // A new file: the list of categories first, the selected profile under its own name.
+  EXPECT_EQ("[main]\nNumberOfCategories=1\nCategory1=Alerts\n[Alerts]\nProfile1=" +
+                run.Dst("console_datfiles/alerts/night.alp") + "\nNumberOfProfiles=1\nExpand=\n",
+            ReadFile(run.Dst("console_datfiles/alerts/categories.ini")));
   EXPECT_EQ("categories.ini merged: " + run.Dst("console_datfiles/alerts/"), run.RunLog().back());
 }
 

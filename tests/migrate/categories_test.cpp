@@ -31,7 +31,8 @@ TEST(MergeCategoriesINIFile, AppendsOldCategoriesAndEntriesAfterTheDestinationsO
             "Profile4=C:\\Vantix\\profiles\\sample.wlp\n"
             "Profile5=c.wlp\n"
             "Expand=1\n"
-            "[Support]\nNumberOfProfiles=1\nProfile1=C:\\Vantix\\profiles\\d.wlp\n"
+            "[Support]\nNumberOfProfiles=2\nProfile1=C:\\Vantix\\profiles\\d.wlp\n"
+            "Profile2=/opt/vantix/profiles/e_vxmigrate.wlp\n"
             "[Samples]\nNumberOfProfiles=1\nProfile1=C:\\Vantix\\profiles\\Sample.wlp\nExpand=1\n");
 
   run.manager().MergeCategoriesINIFile("profiles", "*.wlp", "wlp", "x.wlp, sample.wlp", false);
@@ -42,43 +43,12 @@ TEST(MergeCategoriesINIFile, AppendsOldCategoriesAndEntriesAfterTheDestinationsO
             "Profile2=" + folder + "b_vxmigrate.wlp\n"
             "Profile3=" + folder + "c_vxmigrate.wlp\n"
             "[Web]\nNumberOfProfiles=0\n"
-            "[Support]\nProfile1=" + folder + "d_vxmigrate.wlp\nNumberOfProfiles=1\nExpand=\n"
+            "[Support]\nProfile1=" + folder + "d_vxmigrate.wlp\nProfile2=" + folder +
+            "e_vxmigrate.wlp\nNumberOfProfiles=2\nExpand=\n"
             "[Samples]\nNumberOfProfiles=0\nExpand=1\n",
             ReadFile(run.Dst("profiles/categories.ini")));
   EXPECT_EQ((Entries{"categories.ini merged: " + folder}), run.RunLog());
 }
-
-struct NamingCase {
-  const char* name;
-  bool keepNames;
-  const char* sourceEntry;
-  const char* destinationName;
-};
-
-class EntryNaming : public ::testing::TestWithParam<NamingCase> {};
-
-TEST_P(EntryNaming, FollowsTheCopiesNames) {
-  Installations run;
-  WriteFile(run.Src("links/categories.ini"),
-            std::string("[main]\nNumberOfCategories=1\nCategory1=All\n[All]\nNumberOfProfiles=1\n"
-                        "Profile1=") + GetParam().sourceEntry + "\nExpand=0\n");
-
-  run.manager().MergeCategoriesINIFile("links", "*.llp", "llp", "", GetParam().keepNames);
-
-  EXPECT_EQ("[main]\nNumberOfCategories=1\nCategory1=All\n[All]\nProfile1=" +
-                run.Dst("links/") + GetParam().destinationName + "\nNumberOfProfiles=1\nExpand=0\n",
-            ReadFile(run.Dst("links/categories.ini")));
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, EntryNaming,
-    ::testing::Values(NamingCase{"Marked", false, "C:\\old\\links\\a.llp", "a_vxmigrate.llp"},
-                      NamingCase{"Kept", true, "C:\\old\\links\\a.llp", "a.llp"},
-                      NamingCase{"UnixPath", false, "/old/links/a.b.llp", "a.b_vxmigrate.llp"},
-                      NamingCase{"BareName", false, "a.llp", "a_vxmigrate.llp"},
-                      NamingCase{"NotMarkedTwice", false, "/old/a_vxmigrate.llp",
-                                 "a_vxmigrate.llp"}),
-    [](const ::testing::TestParamInfo<NamingCase>& info) { return info.param.name; });
 
 TEST(MergeCategoriesINIFile, WithoutASourceFileTouchesNothing) {
   Installations run;

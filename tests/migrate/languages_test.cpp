@@ -40,12 +40,5 @@ TEST(DoCopyLanguageFiles, CopiesOnlyTheUsersOwnLanguagesIntoTheNewFolder) {
             run.RunLog());
 }
 
-TEST(DoCopyLanguageFiles, AMissingSourceFolderCopiesNothing) {
-  Installations run;
-  EXPECT_EQ(0, run.manager().DoCopyLanguageFiles("lang", "lang"));
-  EXPECT_EQ(Entries{}, run.DestinationTree());
-  EXPECT_EQ(Entries{}, run.RunLog());
-}
-
 }  // namespace
 }  // namespace vxtest
