@@ -19,7 +19,6 @@ namespace {
 
 // Offsets into the text are 32-bit.
 constexpr size_t kMaxFileSize = UINT32_MAX - 1;
-constexpr size_t kWriteChunk = 1 << 20;
 constexpr size_t kMaxTempBase = 200;
 
 bool WriteAll(int fd, const char* data, size_t size) {
@@ -35,6 +34,8 @@ bool WriteAll(int fd, const char* data, size_t size) {
   return true;
 }
 
+// umask can only be read by setting it; the library runs on one thread, so the moment between the
+// two calls is harmless.
 mode_t CurrentUmask() {
   mode_t mask = umask(0);
   umask(mask);
@@ -109,13 +110,10 @@ bool ResolveReplaceTarget(const std::string& path, ReplaceTarget* target) {
     return true;
   }
   target->path = path;
-  if (S_ISLNK(st.st_mode)) {
-    char* resolved = realpath(path.c_str(), nullptr);  // fails for a dangling link or a loop
-    if (resolved == nullptr) return false;
-    target->path = resolved;
-    free(resolved);
-    if (stat(target->path.c_str(), &st) != 0) return false;
-  }
+  // A link is replaced by the file, never written through: a copied link may point into the source
+  // installation, which a migration must not change. The file takes the mode of what the link
+  // pointed to; a dangling link or a loop is refused.
+  if (S_ISLNK(st.st_mode) && stat(path.c_str(), &st) != 0) return false;
   if (!S_ISREG(st.st_mode)) return false;
   target->exists = true;
   target->mode = st.st_mode & 07777;
@@ -148,29 +146,17 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
   fd_ = mkostemp(name.data(), O_CLOEXEC);
   if (fd_ < 0) return false;
   tempPath_ = name.data();
-  buffer_.reserve(kWriteChunk);
   return true;
-}
-
-bool AtomicFileWriter::Flush() {
-  if (!failed_ && !buffer_.empty() && !WriteAll(fd_, buffer_.data(), buffer_.size())) failed_ = true;
-  buffer_.clear();
-  return !failed_;
 }
 
 bool AtomicFileWriter::Append(std::string_view data) {
   if (failed_ || fd_ < 0) return false;
-  if (buffer_.size() + data.size() > kWriteChunk && !Flush()) return false;
-  if (data.size() >= kWriteChunk) {
-    if (!WriteAll(fd_, data.data(), data.size())) failed_ = true;
-    return !failed_;
-  }
-  buffer_.append(data);
-  return true;
+  if (!WriteAll(fd_, data.data(), data.size())) failed_ = true;
+  return !failed_;
 }
 
 bool AtomicFileWriter::Commit(bool flushToDisk) {
-  if (fd_ < 0 || !Flush()) {
+  if (fd_ < 0 || failed_) {
     Abandon();
     return false;
   }

@@ -41,19 +41,17 @@ class AtomicFileWriter {
 
   // Creates the temporary file in the target's folder. False on failure.
   bool Begin(const ReplaceTarget& target);
-  // Buffered; false once any write has failed.
+  // Writes data to the temporary file (callers buffer); false once any write has failed.
   bool Append(std::string_view data);
-  // Writes what is buffered, gives the file the target's mode (and owner, where allowed), with
+  // Gives the file the target's mode (and owner, where allowed), with
   // flushToDisk syncs it, renames it over the target, and with flushToDisk syncs the folder too.
   bool Commit(bool flushToDisk);
 
  private:
-  bool Flush();
   void Abandon();
 
   ReplaceTarget target_;
   std::string tempPath_;
-  std::string buffer_;
   int fd_ = -1;
   bool failed_ = false;
 };

@@ -34,11 +34,6 @@ INILine::INILine(const INILine& other)
 
 INILine::~INILine() = default;
 
-std::string_view INILine::Text(uint32_t begin, uint32_t end) const {
-  if (!text_ || end <= begin) return std::string_view();
-  return std::string_view(*text_).substr(begin, end - begin);
-}
-
 INILine::KeyCompare::KeyCompare(const vxStringBase& key) : folded_(vxFoldCase(key.view())) {}
 
 INILine::KeyCompare::KeyCompare(const char* key) : folded_(vxFoldCase(key ? key : "")) {}

@@ -45,7 +45,10 @@ class INILine {
 
   INILine();  // for the reader, which fills the layout below
 
-  std::string_view Text(uint32_t begin, uint32_t end) const;
+  std::string_view Text(uint32_t begin, uint32_t end) const {
+    if (!text_ || end <= begin) return std::string_view();
+    return std::string_view(text_->data() + begin, end - begin);
+  }
   std::string_view Leading() const { return Text(leadingBegin_, rawBegin_); }
   // The key as read (or as given to the constructor): what the section's index is keyed by.
   std::string_view LoadedKey() const { return Text(keyBegin_, keyEnd_); }

@@ -11,6 +11,7 @@ class INIFileWriter {
   INIFileWriter(const vxMappedINIFile& file, vxini::AtomicFileWriter& out)
       : file_(file), out_(out), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
     if (file.text_) text_ = *file.text_;
+    buffer_.reserve(kChunk + 4096);
   }
   INIFileWriter(const INIFileWriter&) = delete;
   INIFileWriter& operator=(const INIFileWriter&) = delete;
@@ -19,7 +20,13 @@ class INIFileWriter {
   bool Render();
 
  private:
-  void Put(std::string_view data);
+  void Put(std::string_view data) {
+    if (data.empty()) return;
+    buffer_.append(data);
+    atLineStart_ = data.back() == '\n';
+    if (buffer_.size() >= kChunk) Flush();
+  }
+  void Flush();
   // Starts a new line (or run of lines): the line before it, when the file ended without a line
   // end there, gets one first.
   void StartLine();
@@ -33,14 +40,16 @@ class INIFileWriter {
   vxini::AtomicFileWriter& out_;
   std::string_view fileEol_;
   std::string_view text_;
+  std::string buffer_;
   bool ok_ = true;
   bool atLineStart_ = true;
+
+  static constexpr size_t kChunk = 1 << 20;
 };
 
-void INIFileWriter::Put(std::string_view data) {
-  if (data.empty()) return;
-  ok_ = out_.Append(data) && ok_;
-  atLineStart_ = data.back() == '\n';
+void INIFileWriter::Flush() {
+  if (!buffer_.empty()) ok_ = out_.Append(buffer_) && ok_;
+  buffer_.clear();
 }
 
 void INIFileWriter::StartLine() {
@@ -84,6 +93,7 @@ bool INIFileWriter::Render() {
     PutLines(section->carriedTrailing);
     PutLines(FileText(section->trailingBegin, section->trailingEnd));
   }
+  Flush();
   return ok_;
 }
 
