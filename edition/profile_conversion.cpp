@@ -260,6 +260,42 @@ void ConvertProfile(vxMigrationManager* manager, vxMappedINIFile& profile,
   ExpandAllProfilesKeys(manager, profile, target, ids);
 }
 
+// Copies one Halden profile to its marked name in the OBX profile folder and converts the copy.
+void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
+                    const vxStringBase& destinationProfiles, AdvancedOptionIds& ids) {
+  vxStringBase name(file.BaseName());
+  name.append("_vxmigrate.");
+  name.append("wlp");
+  vxStringBase target;
+  vxFileManager::MakePath(target, destinationProfiles, name, 1);
+  if (access(target.c_str(), F_OK) == 0) {
+    manager->Log("File exists - no copy made:  ", target.c_str());
+    return;
+  }
+  const vxStringBase& source = file.Pathname();
+  if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
+                              nullptr) != 0) {
+    manager->Log("Error: Unable to open file:   ", source.c_str());
+    return;
+  }
+  vxMappedINIFile profile(target);
+  if (profile.Open(1) != 0) {
+    // Left as copied: the user's own file, which the OBX edition may still read.
+    manager->Log("Error: Unable to open file:   ", target.c_str());
+    return;
+  }
+  ConvertProfile(manager, profile, target, ids);
+  if (profile.Close(1) != 0) {
+    manager->Log("Error: Unable to write file:   ", target.c_str());
+    return;
+  }
+  vxStringBase copied("Profile file copied: ");
+  copied.append(source);
+  copied.append(" to ");
+  copied.append(target);
+  manager->Log(copied.c_str());
+}
+
 }  // namespace
 
 int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
@@ -285,39 +321,9 @@ int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
   AdvancedOptionIds ids(manager_);
 
   for (const vxFileInfo& entry : profiles) {
-    const vxFilename& file = entry.GetFilename();
-    if (excluded.Contains(file.Filename())) continue;
-    vxStringBase name(file.BaseName());
-    name.append("_vxmigrate.");
-    name.append("wlp");
-    vxStringBase target;
-    vxFileManager::MakePath(target, destinationProfiles, name, 1);
-    if (access(target.c_str(), F_OK) == 0) {
-      manager_->Log("File exists - no copy made:  ", target.c_str());
-      continue;
+    if (!excluded.Contains(entry.GetFilename().Filename())) {
+      MigrateProfile(manager_, entry.GetFilename(), destinationProfiles, ids);
     }
-    const vxStringBase& source = file.Pathname();
-    if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
-                                nullptr) != 0) {
-      manager_->Log("Error: Unable to open file:   ", source.c_str());
-      continue;
-    }
-    vxMappedINIFile profile(target);
-    if (profile.Open(1) != 0) {
-      // Left as copied: the user's own file, which the OBX edition may still read.
-      manager_->Log("Error: Unable to open file:   ", target.c_str());
-      continue;
-    }
-    ConvertProfile(manager_, profile, target, ids);
-    if (profile.Close(1) != 0) {
-      manager_->Log("Error: Unable to write file:   ", target.c_str());
-      continue;
-    }
-    vxStringBase copied("Profile file copied: ");
-    copied.append(source);
-    copied.append(" to ");
-    copied.append(target);
-    manager_->Log(copied.c_str());
   }
   return 0;
 }

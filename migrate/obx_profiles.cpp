@@ -28,6 +28,35 @@ bool IsInstallationProfileFolder(const vxStringBase& folder) {
   return folder.at(0) == '.' && (folder.at(1) == '/' || folder.at(2) == '\\');
 }
 
+// The folders that carry one profile's data, copied beside its copy. Returns the last path written.
+vxStringBase CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
+                             const vxStringBase& newBase, const vxStringBase& newName) {
+  vxStringBase reportsFrom, reportsTo;
+  vxFileManager::MakePath(reportsFrom, manager.GetSourceDirectory(), kReports, profile.Filename());
+  vxFileManager::MakePath(reportsTo, manager.GetDestinationDirectory(), kReports, newName);
+  vxFileManager::CopyFile(reportsFrom, reportsTo, 1, 1, 0, 0, 0, nullptr, nullptr);
+  manager.Log("Report folder copied: ", reportsTo.c_str());
+
+  vxStringBase databaseFrom, databaseTo;
+  vxFileManager::MakePath(databaseFrom, manager.GetSourceDirectory(), kDatabases,
+                          profile.BaseName());
+  vxFileManager::MakePath(databaseTo, manager.GetDestinationDirectory(), kDatabases, newBase);
+  vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
+  manager.Log("Database folder copied: ", databaseTo.c_str());
+  return databaseTo;
+}
+
+// A profile without its report folders creates its reports on demand unless it says otherwise.
+// After the folders were copied the last path is the database folder, which does not open as a
+// profile: the default then stays unset, as the folders carry the reports.
+void DefaultToReportsOnDemand(const vxStringBase& lastWritten) {
+  vxMappedINIFile copy(lastWritten);
+  if (copy.Open(1) == 0 && copy.GetVal("profile", "ondemandreports").isEmpty()) {
+    copy.SetVal("profile", "ondemandreports", "0");
+    copy.Close(1);
+  }
+}
+
 }  // namespace
 
 int vxMigrationManager::DoCopyOBXProfiles() {
@@ -78,30 +107,8 @@ int vxMigrationManager::DoCopyOBXProfiles() {
                                                nullptr, nullptr);
     Log("Profile copied: ", target.c_str());
 
-    vxStringBase lastWritten(target);
-    if (copied == 0 && copyData) {
-      vxStringBase reportsFrom, reportsTo;
-      vxFileManager::MakePath(reportsFrom, m_sourceDirectory, kReports, name);
-      vxFileManager::MakePath(reportsTo, m_destinationDirectory, kReports, newName);
-      vxFileManager::CopyFile(reportsFrom, reportsTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-      Log("Report folder copied: ", reportsTo.c_str());
-
-      vxStringBase databaseFrom, databaseTo;
-      vxFileManager::MakePath(databaseFrom, m_sourceDirectory, kDatabases, file.BaseName());
-      vxFileManager::MakePath(databaseTo, m_destinationDirectory, kDatabases, newBase);
-      vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-      Log("Database folder copied: ", databaseTo.c_str());
-      lastWritten = databaseTo;
-    }
-
-    // A profile without its report folders creates its reports on demand unless it says otherwise.
-    // After the folders were copied the last path is the database folder, which does not open as a
-    // profile: the default then stays unset, as the folders carry the reports.
-    vxMappedINIFile copy(lastWritten);
-    if (copy.Open(1) == 0 && copy.GetVal("profile", "ondemandreports").isEmpty()) {
-      copy.SetVal("profile", "ondemandreports", "0");
-      copy.Close(1);
-    }
+    const bool withData = copied == 0 && copyData;
+    DefaultToReportsOnDemand(withData ? CopyProfileData(*this, file, newBase, newName) : target);
   }
   return 0;
 }
