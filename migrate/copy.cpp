@@ -1,7 +1,8 @@
-// Copies files and folders from the source installation into the destination. No operation here
-// replaces an existing destination file unless its caller's option asks for it, and in an in-place
-// run (source folder equal to destination folder) every operation does nothing and returns 0.
-// A file that cannot be copied costs one "Error: " line and the walk goes on with the rest.
+// Copies files and folders from the source installation into the destination. The whole-tree
+// copies never replace an existing destination file; the named-file and folder copies replace one
+// (only when older, given the newer-only option). In an in-place run (source folder equal to
+// destination folder) every operation does nothing and returns 0. A file that cannot be copied
+// costs one "Error: " line and the walk goes on with the rest.
 
 #include <sys/stat.h>
 #include <unistd.h>
