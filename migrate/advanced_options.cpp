@@ -34,14 +34,14 @@ void UseInPlaceBackup(vxStringBase& path) {
   }
 }
 
-// The destination's entries of one family, as the merge adds to them: which identifiers it holds
+// The destination's entries of one family, as the merge adds to them: which identifiers they hold
 // (ignoring case) and the number the next added entry takes.
 //
-// The identifiers of entries 0..count-1 are indexed once; an added entry is compared with the
-// destination's own entries only, never with entries the merge added. Numbers follow the count.
-// A section that already sits at such a number (a count left behind by a hand edit) is taken as
-// one of the destination's entries: it is indexed, the count grows over it, and it is never
-// overwritten.
+// The entries are the sections numbered below the count. Their identifiers are indexed once; an
+// added entry is compared with the destination's own entries only, never with entries the merge
+// added. New numbers follow the count. A section that already sits at such a number (a count left
+// behind by a hand edit) is never overwritten: the count grows over it, so it becomes one of the
+// destination's entries, indexed like the others, and the new entry takes the next free number.
 class EntryNumbering {
  public:
   EntryNumbering(const vxMappedINIFile& destination, const vxStringBase& prefix, const char* idKey,
@@ -54,28 +54,21 @@ class EntryNumbering {
   EntryNumbering& operator=(const EntryNumbering&) = delete;
 
   // True when the destination holds an entry with this identifier: the destination wins.
-  bool Holds(const vxStringBase& id) {
-    TakeOverExistingSections();
-    return ids_.count(vxFoldCase(id.view())) != 0;
-  }
+  bool Holds(const vxStringBase& id) const { return ids_.count(vxFoldCase(id.view())) != 0; }
 
-  // The number of the entry about to be added.
-  // REQUIRES: Holds() was asked just before, so sections at the next numbers are taken over.
-  long Next() const { return next_; }
-  // The entry was added at Next(); the count is now Next().
-  void Added() { ++next_; }
+  // Reserves the number for an entry about to be added; the count becomes that number plus one.
+  long TakeNextNumber() {
+    while (destination_.HasSection(SectionName(prefix_, next_))) {
+      IndexEntry(next_);
+      ++next_;
+    }
+    return next_++;
+  }
 
  private:
   void IndexEntry(long number) {
     const INILineList* lines = destination_.GetPropertyList(SectionName(prefix_, number));
     if (lines != nullptr) ids_.insert(vxFoldCase(destination_.GetVal(lines, idKey_).view()));
-  }
-
-  void TakeOverExistingSections() {
-    while (destination_.HasSection(SectionName(prefix_, next_))) {
-      IndexEntry(next_);
-      ++next_;
-    }
   }
 
   const vxMappedINIFile& destination_;
@@ -166,12 +159,11 @@ int vxMigrationManager::MergeAdvancedOptionsFiles(const vxStringBase& sourceFile
     const INILineList* lines = source.GetPropertyList(SectionName(prefix, i));
     if (lines == nullptr) continue;
     if (numbering.Holds(source.GetVal(lines, "profilename"))) continue;
-    const long number = numbering.Next();
+    const long number = numbering.TakeNextNumber();
     const std::string qualificationNumber =
         UsesQualificationZero(m_destinationProductID) ? "0" : std::to_string(number);
     AddEntry(destination, SectionName(prefix, number), *lines,
              renumber ? &qualificationNumber : nullptr);
-    numbering.Added();
     destination.SetVal("Default", countKey, number + 1);
   }
 
@@ -266,9 +258,8 @@ int vxMigrationManager::DoOBXMergeAdvancedOptionsFiles() {
     const INILineList* old = source.GetPropertyList(SectionName("queryprofile", i));
     if (old == nullptr) continue;
     if (numbering.Holds(source.GetVal(old, "profileid"))) continue;
-    const long number = numbering.Next();
+    const long number = numbering.TakeNextNumber();
     WriteQueryEntry(destination, SectionName("queryprofile", number), source, old);
-    numbering.Added();
     destination.SetVal("default", "queryprofilecount", number + 1);
   }
 
