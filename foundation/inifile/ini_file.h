@@ -8,10 +8,12 @@
 
 #include <memory>
 #include <string>
+#include <string_view>
 #include <unordered_map>
 #include <vector>
 
 #include "foundation/inifile/ini_line.h"
+#include "foundation/inifile/ini_text.h"
 #include "foundation/string/string_base.h"
 
 class vxMappedINIFile {
@@ -83,18 +85,29 @@ class vxMappedINIFile {
   bool IsLoaded() const { return loaded_; }
 
  private:
-  struct Section;
+  struct Section;  // defined in ini_section.h
+  using SectionIndex =
+      std::unordered_map<std::string_view, Section*, vxini::FoldHash, vxini::FoldEqual>;
+
   Section* FindSection(std::string_view name) const;
-  Section* FindOrAddSection(const vxStringBase& name);
+  Section* FindOrAddSection(std::string_view name);
+  // The first line of the section with that key, or null. Rebuilds the section's index when the
+  // callers changed its list behind the object's back.
+  INILine* FindLine(const Section& section, std::string_view key) const;
+  void AppendLine(Section& section, INILine* line);   // takes ownership
+  INILine* CopyForThisFile(const INILine& line) const;
+  void CopyMissingKeys(Section& section, const INILineList& lines);
   void Clear();
   int Write(bool flushToDisk);
 
   vxStringBase filename_;
   bool loaded_ = false;
-  std::string preamble_;       // lines before the first section, as read
-  std::string defaultEol_;     // line end used for new lines: the file's first, else "\n"
-  std::vector<std::unique_ptr<Section>> sections_;                    // file order
-  std::unordered_map<std::string, Section*> sectionIndex_;            // folded name -> section
+  std::shared_ptr<const std::string> text_;  // the file as read; sections point into it
+  uint32_t preambleEnd_ = 0;                 // [0, preambleEnd_): lines before the first section
+  vxini::Eol fileEol_ = vxini::Eol::kLF;     // line end for new lines: the file's first, else LF
+  std::vector<std::unique_ptr<Section>> sections_;  // file order
+  SectionIndex sectionIndex_;                       // name -> first section of that name
+  size_t duplicateSections_ = 0;                    // sections hidden behind an earlier namesake
 
   friend class INIFileReader;
   friend class INIFileWriter;

@@ -49,7 +49,11 @@ class vxProc2 {
   int32_t childError_ = 0;
 
  private:
-  void RunChild(const char* folder, unsigned long priority);
+  // Sets the child up and execs the program; returns only when a descriptor or the folder could
+  // not be set up (the caller's Spawn then returns 0 in the child). Allocates nothing: everything
+  // it needs is prepared before the fork.
+  void RunChild(char* const argv[], const char* folder, int nice, long openMax);
+  void CloseHandedOverDescriptors();
 
   std::string program_;
   std::string argumentText_;

@@ -1,0 +1,155 @@
+// Whole-file reading and writing. A truncating open writes to a hidden temporary file beside the
+// real one, renamed over it by Close; until then, and after any failure, the old content stays.
+
+#ifndef _FILE_OFFSET_BITS
+#define _FILE_OFFSET_BITS 64
+#endif
+
+#include "foundation/files/basic_file.h"
+
+#include <fcntl.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <string>
+
+#include "foundation/files/temp_file.h"
+
+namespace {
+
+const size_t kReadChunk = 64 * 1024;
+
+// Opens the temporary file that a truncating open writes to. name is changed to the link's target
+// when it is a symbolic link, so the link survives the rewrite. Returns the descriptor or -1.
+int OpenRewrite(std::string& name, int flags, mode_t permissions, std::string& tempName) {
+  struct stat st;
+  bool exists = stat(name.c_str(), &st) == 0;
+  if (exists) {
+    if ((flags & O_CREAT) && (flags & O_EXCL)) return -1;
+    if (S_ISDIR(st.st_mode)) return -1;
+    // The rename must not become a way around a file's write protection.
+    if (access(name.c_str(), W_OK) != 0) return -1;
+    struct stat link;
+    if (lstat(name.c_str(), &link) == 0 && S_ISLNK(link.st_mode)) {
+      char* target = realpath(name.c_str(), nullptr);
+      if (target == nullptr) return -1;
+      name = target;
+      free(target);
+    }
+  } else if (!(flags & O_CREAT)) {
+    return -1;
+  }
+  size_t slash = name.rfind('/');
+  std::string folder = slash == std::string::npos ? "." : (slash == 0 ? "/" : name.substr(0, slash));
+  std::string base = slash == std::string::npos ? name : name.substr(slash + 1);
+  int dirFd = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (dirFd < 0) return -1;
+  std::string temp;
+  int fd = vxfiles::CreateTempFileAt(dirFd, base.c_str(), exists ? 0600 : permissions, temp);
+  close(dirFd);
+  if (fd < 0) return -1;
+  tempName = slash == std::string::npos ? temp : folder + "/" + temp;
+  if (exists) {
+    // Owner first: a change of owner clears the set-id bits that the mode then restores.
+    if (fchown(fd, st.st_uid, st.st_gid) != 0) {
+      // Only root may give a file away; anyone else keeps the file as their own.
+    }
+    fchmod(fd, st.st_mode & 07777);
+  }
+  return fd;
+}
+
+}  // namespace
+
+vxBasicFile::vxBasicFile(const vxStringBase& name, unsigned int openFlags, unsigned int accessMode,
+                         unsigned int permissions)
+    : name_(name.str()), flags_(openFlags | accessMode), permissions_(permissions) {}
+
+vxBasicFile::~vxBasicFile() {
+  if (fd_ >= 0) close(fd_);
+  if (!tempName_.empty()) unlink(tempName_.c_str());
+}
+
+int vxBasicFile::Open() {
+  if (fd_ >= 0) return 0;
+  if (name_.empty()) return 1;
+  writeFailed_ = false;
+  int flags = static_cast<int>(flags_) | O_CLOEXEC;
+  int access = flags & O_ACCMODE;
+  mode_t permissions = permissions_ != 0 ? static_cast<mode_t>(permissions_) : 0666;
+  if ((flags & O_TRUNC) && access != O_RDONLY) {
+    fd_ = OpenRewrite(name_, flags, permissions, tempName_);
+    return fd_ >= 0 ? 0 : 1;
+  }
+  fd_ = open(name_.c_str(), flags, permissions);
+  if (fd_ < 0 && access == O_RDWR && !(flags & O_CREAT) && (errno == EACCES || errno == EROFS)) {
+    // A file we may read but not write (a read-only source installation) can still be read;
+    // a Write then fails.
+    fd_ = open(name_.c_str(), (flags & ~O_ACCMODE) | O_RDONLY);
+  }
+  return fd_ >= 0 ? 0 : 1;
+}
+
+int vxBasicFile::ReadAll(vxStringBase& text) {
+  if (fd_ < 0) return 1;
+  lseek(fd_, 0, SEEK_SET);  // the whole content, whatever was read before
+  // Sized from fstat (one byte more, to see the end in one read); a file that grows meanwhile, or
+  // a size that lies, only costs a doubling.
+  struct stat st;
+  size_t expected = 0;
+  if (fstat(fd_, &st) == 0 && S_ISREG(st.st_mode) && st.st_size > 0 &&
+      static_cast<unsigned long long>(st.st_size) < (1ULL << 30)) {
+    expected = static_cast<size_t>(st.st_size);
+  }
+  std::string content(expected + 1 > kReadChunk ? expected + 1 : kReadChunk, '\0');
+  size_t used = 0;
+  for (;;) {
+    if (used == content.size()) content.resize(content.size() * 2);
+    ssize_t n = read(fd_, &content[used], content.size() - used);
+    if (n == 0) break;
+    if (n < 0) {
+      if (errno == EINTR) continue;
+      return 1;
+    }
+    used += static_cast<size_t>(n);
+  }
+  content.resize(used);
+  text = vxStringBase(std::string_view(content));
+  return 0;
+}
+
+int vxBasicFile::Write(const vxStringBase& text, unsigned long& written) {
+  written = 0;
+  if (fd_ < 0) return 1;
+  const char* data = text.c_str();
+  size_t size = text.length();
+  while (size > 0) {
+    ssize_t n = write(fd_, data, size);
+    if (n < 0) {
+      if (errno == EINTR) continue;
+      writeFailed_ = true;  // a rewrite that missed bytes must not replace the old file
+      return 1;
+    }
+    data += n;
+    size -= static_cast<size_t>(n);
+    written += static_cast<unsigned long>(n);
+  }
+  return 0;
+}
+
+int vxBasicFile::Close() {
+  if (fd_ < 0) return 0;
+  bool ok = close(fd_) == 0 && !writeFailed_;
+  fd_ = -1;
+  if (tempName_.empty()) return ok ? 0 : 1;
+  if (ok && rename(tempName_.c_str(), name_.c_str()) == 0) {
+    tempName_.clear();
+    return 0;
+  }
+  unlink(tempName_.c_str());
+  tempName_.clear();
+  return 1;
+}

@@ -1,0 +1,272 @@
+// The INI model's lookups and changes: sections and keys found through hash indexes that ignore
+// ASCII case, values set in their line's place, keys and sections added after the existing ones,
+// and whole sections and files merged in with this file's values winning. Reading and writing the
+// file live in ini_reader.cpp and ini_writer.cpp.
+
+#include <algorithm>
+#include <unordered_set>
+
+#include "foundation/inifile/ini_file.h"
+#include "foundation/inifile/ini_section.h"
+
+vxMappedINIFile::vxMappedINIFile() = default;
+
+vxMappedINIFile::vxMappedINIFile(const char* filename) : filename_(filename) {}
+
+vxMappedINIFile::vxMappedINIFile(const vxStringBase& filename) : filename_(filename) {}
+
+vxMappedINIFile::~vxMappedINIFile() { Clear(); }
+
+void vxMappedINIFile::SetFilename(const char* filename) { SetFilename(vxStringBase(filename)); }
+
+void vxMappedINIFile::SetFilename(const vxStringBase& filename) {
+  // What was loaded from one file gives no right to replace another.
+  if (filename != filename_) loaded_ = false;
+  filename_ = filename;
+}
+
+void vxMappedINIFile::Clear() {
+  sectionIndex_.clear();  // its keys point into the sections
+  sections_.clear();
+  text_.reset();
+  preambleEnd_ = 0;
+  fileEol_ = vxini::Eol::kLF;
+  duplicateSections_ = 0;
+}
+
+vxMappedINIFile::Section* vxMappedINIFile::FindSection(std::string_view name) const {
+  auto it = sectionIndex_.find(name);
+  return it == sectionIndex_.end() ? nullptr : it->second;
+}
+
+vxMappedINIFile::Section* vxMappedINIFile::FindOrAddSection(std::string_view name) {
+  if (Section* section = FindSection(name)) return section;
+  auto section = std::make_unique<Section>();
+  section->name.assign(name.data(), name.size());
+  section->headerPrefix = "[";
+  section->headerSuffix = "]";
+  section->nameFromCaller = true;
+  Section* added = section.get();
+  sections_.push_back(std::move(section));
+  sectionIndex_.emplace(added->name, added);
+  return added;
+}
+
+INILine* vxMappedINIFile::FindLine(const Section& section, std::string_view key) const {
+  section.EnsureIndex();
+  auto it = section.index.find(key);
+  if (it == section.index.end()) return nullptr;
+  if (vxini::EqualsFolded(it->second->m_key.view(), key)) return it->second;
+  // A caller renamed a key in place: index the lines afresh and trust only a verified hit.
+  section.RebuildIndex();
+  it = section.index.find(key);
+  if (it != section.index.end() && vxini::EqualsFolded(it->second->m_key.view(), key)) {
+    return it->second;
+  }
+  return nullptr;
+}
+
+void vxMappedINIFile::AppendLine(Section& section, INILine* line) {
+  std::unique_ptr<INILine> owned(line);
+  section.EnsureIndex();
+  section.lines.push_back(line);
+  owned.release();
+  section.index.emplace(line->LoadedKey(), line);
+  section.indexedCount = section.lines.size();
+}
+
+INILine* vxMappedINIFile::CopyForThisFile(const INILine& line) const {
+  // The copy keeps its key, value and spacing; the comments around it stay in the other file and
+  // it ends like this file's lines.
+  INILine* copy = new INILine(line);
+  copy->leadingBegin_ = copy->rawBegin_;
+  copy->carried_.reset();
+  copy->eol_ = vxini::Eol::kFile;
+  return copy;
+}
+
+void vxMappedINIFile::CopyMissingKeys(Section& section, const INILineList& lines) {
+  if (&lines == &section.lines) return;
+  for (const INILine* line : lines) {
+    // Also skips a key given twice: once copied, it is no longer missing.
+    if (line == nullptr || line->m_key.isEmpty() || FindLine(section, line->m_key.view())) continue;
+    AppendLine(section, CopyForThisFile(*line));
+  }
+}
+
+const vxStringBase& vxMappedINIFile::GetVal(const vxStringBase& section,
+                                            const vxStringBase& key) const {
+  const Section* found = FindSection(section.view());
+  const INILine* line = found ? FindLine(*found, key.view()) : nullptr;
+  return line ? line->m_value : vxStringBase::NullStr;
+}
+
+int vxMappedINIFile::GetVal(const vxStringBase& section, const vxStringBase& key,
+                            vxStringBase& value) const {
+  const Section* found = FindSection(section.view());
+  const INILine* line = found ? FindLine(*found, key.view()) : nullptr;
+  if (line == nullptr) {
+    value.makeNull();
+    return 1;
+  }
+  value = line->m_value;
+  return 0;
+}
+
+const vxStringBase& vxMappedINIFile::GetVal(const INILineList* lines,
+                                            const vxStringBase& key) const {
+  if (lines == nullptr) return vxStringBase::NullStr;
+  auto it = std::find_if(lines->begin(), lines->end(), INILine::KeyCompare(key));
+  return it == lines->end() ? vxStringBase::NullStr : (*it)->m_value;
+}
+
+void vxMappedINIFile::SetVal(const vxStringBase& section, const vxStringBase& key,
+                             const vxStringBase& value) {
+  // A line with an empty key would not read back as a property line.
+  if (key.isEmpty()) return;
+  Section* target = FindOrAddSection(section.view());
+  if (INILine* line = FindLine(*target, key.view())) {
+    line->m_value = value;
+    return;
+  }
+  AppendLine(*target, new INILine(key, value));
+}
+
+void vxMappedINIFile::SetVal(const vxStringBase& section, const vxStringBase& key, long value) {
+  vxStringBase text;
+  text.append(value);
+  SetVal(section, key, text);
+}
+
+int vxMappedINIFile::RemoveKey(const vxStringBase& section, const vxStringBase& key) {
+  Section* found = FindSection(section.view());
+  INILine* line = found ? FindLine(*found, key.view()) : nullptr;
+  if (line == nullptr) return 1;
+  INILineList& lines = found->lines;
+  auto pos = std::find(lines.begin(), lines.end(), line);
+  if (pos == lines.end()) return 1;
+
+  // The comment and blank lines above the removed line stay, above whatever now follows it.
+  std::string kept = line->carried_ ? *line->carried_ : std::string();
+  kept.append(line->Leading());
+  if (!kept.empty()) {
+    if (pos + 1 != lines.end()) {
+      INILine* next = *(pos + 1);
+      if (next->carried_) kept.append(*next->carried_);
+      next->carried_ = std::make_unique<std::string>(std::move(kept));
+    } else {
+      found->carriedTrailing.insert(0, kept);
+    }
+  }
+
+  // Drop the index entry before the line (its key lives in the line's text); a later line with
+  // the same key, if any, becomes the one found.
+  auto entry = found->index.find(line->LoadedKey());
+  if (entry != found->index.end() && entry->second == line) found->index.erase(entry);
+  pos = lines.erase(pos);
+  for (auto later = pos; later != lines.end(); ++later) {
+    if (vxini::EqualsFolded((*later)->LoadedKey(), line->LoadedKey())) {
+      found->index.emplace((*later)->LoadedKey(), *later);
+      break;
+    }
+  }
+  found->indexedCount = lines.size();
+  delete line;
+  return 0;
+}
+
+INILineList* vxMappedINIFile::GetPropertyList(const char* section) {
+  if (section == nullptr) return nullptr;
+  Section* found = FindSection(section);
+  return found ? &found->lines : nullptr;
+}
+
+INILineList* vxMappedINIFile::GetPropertyList(const vxStringBase& section) {
+  Section* found = FindSection(section.view());
+  return found ? &found->lines : nullptr;
+}
+
+const INILineList* vxMappedINIFile::GetPropertyList(const vxStringBase& section) const {
+  const Section* found = FindSection(section.view());
+  return found ? &found->lines : nullptr;
+}
+
+void vxMappedINIFile::AddMapSection(const char* section, const INILineList* lines) {
+  if (section == nullptr) return;
+  Section* target = FindOrAddSection(section);
+  if (lines != nullptr) CopyMissingKeys(*target, *lines);
+}
+
+void vxMappedINIFile::UpdateMapSection(const char* section, const INILineList* lines) {
+  if (section == nullptr) return;
+  Section* target = FindSection(section);
+  if (target == nullptr) {
+    AddMapSection(section, lines);
+    return;
+  }
+  if (lines == nullptr || lines == &target->lines) return;
+  std::unordered_set<std::string_view, vxini::FoldHash, vxini::FoldEqual> seen;
+  for (const INILine* line : *lines) {
+    if (line == nullptr || line->m_key.isEmpty()) continue;
+    if (!seen.insert(line->m_key.view()).second) continue;  // a repeated key: the first counts
+    if (INILine* existing = FindLine(*target, line->m_key.view())) {
+      existing->m_value = line->m_value;
+    } else {
+      AppendLine(*target, CopyForThisFile(*line));
+    }
+  }
+}
+
+void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other) {
+  if (&other == this) return;
+  for (const auto& from : other.sections_) {
+    // A section repeated in the other file is hidden there too: only the first counts.
+    if (other.FindSection(from->name) != from.get()) continue;
+    Section* target = FindOrAddSection(from->name);
+    from->EnsureIndex();
+    for (const INILine* line : from->lines) {
+      if (line == nullptr) continue;
+      auto first = from->index.find(line->LoadedKey());
+      if (first == from->index.end() || first->second != line) continue;  // a repeated key
+      if (FindLine(*target, line->m_key.view()) != nullptr) continue;   // the destination wins
+      AppendLine(*target, CopyForThisFile(*line));
+    }
+  }
+}
+
+int vxMappedINIFile::RenameSection(const vxStringBase& from, const vxStringBase& to) {
+  Section* section = FindSection(from.view());
+  if (section == nullptr) return 1;
+  Section* existing = FindSection(to.view());
+  if (existing != nullptr && existing != section) return 1;
+
+  std::string oldName = section->name;
+  sectionIndex_.erase(section->name);
+  section->name = to.str();
+  section->nameFromCaller = true;
+  sectionIndex_.emplace(section->name, section);
+  if (duplicateSections_ > 0 && !vxini::EqualsFolded(oldName, section->name)) {
+    // A later section of the old name was hidden behind this one; it is now the one found.
+    for (const auto& other : sections_) {
+      if (other.get() != section && vxini::EqualsFolded(other->name, oldName)) {
+        sectionIndex_.emplace(other->name, other.get());
+        --duplicateSections_;
+        break;
+      }
+    }
+  }
+  return 0;
+}
+
+std::vector<vxStringBase> vxMappedINIFile::GetSectionNames() const {
+  std::vector<vxStringBase> names;
+  names.reserve(sections_.size());
+  for (const auto& section : sections_) {
+    if (FindSection(section->name) == section.get()) names.emplace_back(section->name);
+  }
+  return names;
+}
+
+bool vxMappedINIFile::HasSection(const vxStringBase& section) const {
+  return FindSection(section.view()) != nullptr;
+}

@@ -1,0 +1,60 @@
+// One section of a vxMappedINIFile: its header line, its property lines in file order, the
+// non-property lines after the last property line, and a lazily built index from the key (ASCII
+// case ignored) to the first line holding it. Internal to the INI model; owns its lines.
+
+#ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
+#define VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+
+#include "foundation/inifile/ini_file.h"
+#include "foundation/inifile/ini_line.h"
+#include "foundation/inifile/ini_text.h"
+
+struct vxMappedINIFile::Section {
+  using LineIndex = std::unordered_map<std::string_view, INILine*, vxini::FoldHash, vxini::FoldEqual>;
+
+  Section() = default;
+  ~Section() {
+    index.clear();
+    for (INILine* line : lines) delete line;
+  }
+  Section(const Section&) = delete;
+  Section& operator=(const Section&) = delete;
+
+  // Makes the index match the lines when their number changed since it was built.
+  void EnsureIndex() const {
+    if (indexedCount != lines.size()) RebuildIndex();
+  }
+  void RebuildIndex() const {
+    index.clear();
+    index.reserve(lines.size());
+    for (INILine* line : lines) {
+      if (line != nullptr) index.emplace(line->LoadedKey(), line);  // the first one stays
+    }
+    indexedCount = lines.size();
+  }
+
+  // The header line is written as prefix + name + suffix + line end, so that an unchanged name
+  // gives the line back as read and a renamed one keeps the brackets' surroundings.
+  std::string name;            // the text between the outer brackets, blanks around it trimmed
+  std::string headerPrefix;    // e.g. "[" or "  [ "
+  std::string headerSuffix;    // e.g. "]" or "]  ; note"
+  bool nameFromCaller = false;  // set by a caller: written up to its first line break
+  vxini::Eol headerEol = vxini::Eol::kFile;
+
+  INILineList lines;
+  // [trailingBegin, trailingEnd) of the file's text: comment, blank or stray lines after the last
+  // property line. New keys go before them, so a section's closing blank line stays last.
+  uint32_t trailingBegin = 0;
+  uint32_t trailingEnd = 0;
+  std::string carriedTrailing;  // lines kept from removed property lines, written before those
+
+  mutable LineIndex index;  // views into the lines' own immutable text
+  mutable size_t indexedCount = static_cast<size_t>(-1);
+};
+
+#endif  // VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_

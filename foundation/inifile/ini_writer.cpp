@@ -1,0 +1,128 @@
+// Writing an INI file back: every piece that was read is given back byte for byte, a changed key or
+// value is spliced into its line between the line's own spacing, and new lines end like the file's
+// first line. Close(1) never replaces an existing file this object did not load.
+
+#include "foundation/inifile/ini_disk.h"
+#include "foundation/inifile/ini_file.h"
+#include "foundation/inifile/ini_section.h"
+
+class INIFileWriter {
+ public:
+  INIFileWriter(const vxMappedINIFile& file, vxini::AtomicFileWriter& out)
+      : file_(file), out_(out), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
+    if (file.text_) text_ = *file.text_;
+    buffer_.reserve(kChunk + 4096);
+  }
+  INIFileWriter(const INIFileWriter&) = delete;
+  INIFileWriter& operator=(const INIFileWriter&) = delete;
+
+  // False when a write failed.
+  bool Render();
+
+ private:
+  void Put(std::string_view data) {
+    if (data.empty()) return;
+    buffer_.append(data);
+    atLineStart_ = data.back() == '\n';
+    if (buffer_.size() >= kChunk) Flush();
+  }
+  void Flush();
+  // Starts a new line (or run of lines): the line before it, when the file ended without a line
+  // end there, gets one first.
+  void StartLine();
+  void PutLines(std::string_view lines);
+  void PutProperty(const INILine& line);
+  std::string_view FileText(uint32_t begin, uint32_t end) const {
+    return end > begin ? text_.substr(begin, end - begin) : std::string_view();
+  }
+
+  const vxMappedINIFile& file_;
+  vxini::AtomicFileWriter& out_;
+  std::string_view fileEol_;
+  std::string_view text_;
+  std::string buffer_;
+  bool ok_ = true;
+  bool atLineStart_ = true;
+
+  static constexpr size_t kChunk = 1 << 20;
+};
+
+void INIFileWriter::Flush() {
+  if (!buffer_.empty()) ok_ = out_.Append(buffer_) && ok_;
+  buffer_.clear();
+}
+
+void INIFileWriter::StartLine() {
+  if (!atLineStart_) Put(fileEol_);
+}
+
+void INIFileWriter::PutLines(std::string_view lines) {
+  if (lines.empty()) return;
+  StartLine();
+  Put(lines);
+}
+
+void INIFileWriter::PutProperty(const INILine& line) {
+  if (line.carried_) PutLines(*line.carried_);
+  PutLines(line.Leading());
+  StartLine();
+  // Unchanged texts are given back as read; changed ones are kept to one line.
+  std::string_view key = line.m_key.view();
+  if (key != line.LoadedKey()) key = vxini::OneLine(key);
+  std::string_view value = line.m_value.view();
+  if (value != line.LoadedValue()) value = vxini::OneLine(value);
+  Put(line.Text(line.rawBegin_, line.keyBegin_));
+  Put(key);
+  Put(line.Text(line.keyEnd_, line.valueBegin_));
+  Put(value);
+  Put(line.Text(line.valueEnd_, line.rawEnd_));
+  Put(vxini::EolText(line.eol_, file_.fileEol_));
+}
+
+bool INIFileWriter::Render() {
+  PutLines(FileText(0, file_.preambleEnd_));
+  for (const auto& section : file_.sections_) {
+    StartLine();
+    Put(section->headerPrefix);
+    Put(section->nameFromCaller ? vxini::OneLine(section->name) : section->name);
+    Put(section->headerSuffix);
+    Put(vxini::EolText(section->headerEol, file_.fileEol_));
+    for (const INILine* line : section->lines) {
+      if (line != nullptr) PutProperty(*line);
+    }
+    PutLines(section->carriedTrailing);
+    PutLines(FileText(section->trailingBegin, section->trailingEnd));
+  }
+  Flush();
+  return ok_;
+}
+
+int vxMappedINIFile::Write(bool flushToDisk) {
+  int result = 1;
+  try {
+    vxini::ReplaceTarget target;
+    // An existing file that was never loaded (or failed to load) is not ours to replace.
+    if (vxini::ResolveReplaceTarget(filename_.str(), &target) && (loaded_ || !target.exists)) {
+      vxini::AtomicFileWriter out;
+      INIFileWriter writer(*this, out);
+      if (out.Begin(target) && writer.Render() && out.Commit(flushToDisk)) result = 0;
+    }
+  } catch (...) {
+    result = 1;
+  }
+  return result;
+}
+
+int vxMappedINIFile::Close(unsigned int save) {
+  int result = save != 0 ? Write(false) : 0;
+  Clear();
+  loaded_ = false;
+  return result;
+}
+
+int vxMappedINIFile::CloseFW(unsigned int save) {
+  int result = save != 0 ? Write(true) : 0;
+  Clear();
+  loaded_ = false;
+  return result;
+}
