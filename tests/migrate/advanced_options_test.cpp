@@ -269,13 +269,15 @@ TEST(ReportingServerOptions, MergesEveryKindInOrder) {
   const char* kinds[] = {"contentgroups", "pathsanalysis", "urlreplacement", "tradequill"};
   for (const char* kind : kinds) {
     std::string file = std::string("vxm_vxx/datfiles/") + kind + "/default.ini";
-    std::string old = "[Default]\n";
+    std::string counts = "[Default]\n";
+    std::string entries;
     for (const char* prefix : {"contentgroupprofile", "pathsanalysisprofile",
                                "urlreplacementprofile", "adcampaignprofile", "productprofile",
                                "categoryprofile"}) {
-      old += std::string(prefix) + "Count=1\n[" + prefix + "0]\nprofilename=" + kind + "\n";
+      counts += std::string(prefix) + "Count=1\n";
+      entries += std::string("[") + prefix + "0]\nprofilename=" + kind + "\n";
     }
-    WriteFile(run.Src(file), old);
+    WriteFile(run.Src(file), counts + entries);
     WriteFile(run.Dst(file), "[Default]\n");
   }
   WriteFile(run.Src(kPages), OldQueryEntries());

@@ -118,7 +118,7 @@ std::string RandomText(std::mt19937& random) {
 TEST(DataFileMerge, AgreesWithComparingEveryLine) {
   SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
   std::mt19937 random(20240611);
-  for (int round = 0; round < 1500; ++round) {
+  for (int round = 0; round < 800; ++round) {
     const std::string destination = RandomText(random);
     const std::string source = RandomText(random);
     WriteFile(run.Src("list.txt"), source);
