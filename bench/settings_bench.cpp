@@ -1,6 +1,6 @@
 // Settings merges on installations grown over years: data files, advanced-option files and
-// keyword files of 10,000 and 100,000 entries on each side, half of the old entries already in the
-// new file. The time per merge should grow about linearly with the entries.
+// keyword files of 10,000 and 100,000 entries (and more) on each side, half of the old entries
+// already in the new file. The time per merge should grow about linearly with the entries.
 
 #include <benchmark/benchmark.h>
 #include <stdlib.h>
@@ -72,7 +72,7 @@ void BM_DataFileMerge(benchmark::State& state) {
   }
   state.SetItemsProcessed(state.iterations() * n * 2);
 }
-BENCHMARK(BM_DataFileMerge)->Arg(10000)->Arg(100000)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_DataFileMerge)->Arg(10000)->Arg(100000)->Arg(1000000)->Unit(benchmark::kMillisecond);
 
 std::string AdvancedOptions(long count, long firstName) {
   std::string text = "[Default]\ncontentgroupprofileCount=" + std::to_string(count) + "\n";
@@ -101,7 +101,7 @@ void BM_AdvancedOptionsMerge(benchmark::State& state) {
   }
   state.SetItemsProcessed(state.iterations() * n * 2);
 }
-BENCHMARK(BM_AdvancedOptionsMerge)->Arg(10000)->Arg(100000)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_AdvancedOptionsMerge)->Arg(10000)->Arg(20000)->Arg(100000)->Unit(benchmark::kMillisecond);
 
 std::string Keywords(long count, long firstName) {
   std::string list = "[SearchEngines]\n";

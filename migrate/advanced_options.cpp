@@ -47,6 +47,7 @@ class EntryNumbering {
   EntryNumbering(const vxMappedINIFile& destination, const vxStringBase& prefix, const char* idKey,
                  long count)
       : destination_(destination), prefix_(prefix), idKey_(idKey), next_(count) {
+    ids_.reserve(static_cast<size_t>(count));
     for (long j = 0; j < count; ++j) IndexEntry(j);
   }
 
