@@ -9,22 +9,23 @@
 
 #include <fcntl.h>
 #include <stdio.h>
-#include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <string>
 
+#include "foundation/files/dir_entries.h"
 #include "foundation/files/temp_file.h"
 
 namespace {
 
 const size_t kReadChunk = 64 * 1024;
 
-// Opens the temporary file that a truncating open writes to. name is changed to the link's target
-// when it is a symbolic link, so the link survives the rewrite. Returns the descriptor or -1.
-int OpenRewrite(std::string& name, int flags, mode_t permissions, std::string& tempName) {
+// Opens the temporary file that a truncating open writes to. A symbolic link at name is replaced
+// by the new file, never written through: after a copy it may point into the source installation.
+// Returns the descriptor or -1.
+int OpenRewrite(const std::string& name, int flags, mode_t permissions, std::string& tempName) {
   struct stat st;
   bool exists = stat(name.c_str(), &st) == 0;
   if (exists) {
@@ -32,26 +33,18 @@ int OpenRewrite(std::string& name, int flags, mode_t permissions, std::string& t
     if (S_ISDIR(st.st_mode)) return -1;
     // The rename must not become a way around a file's write protection.
     if (access(name.c_str(), W_OK) != 0) return -1;
-    struct stat link;
-    if (lstat(name.c_str(), &link) == 0 && S_ISLNK(link.st_mode)) {
-      char* target = realpath(name.c_str(), nullptr);
-      if (target == nullptr) return -1;
-      name = target;
-      free(target);
-    }
   } else if (!(flags & O_CREAT)) {
     return -1;
   }
-  size_t slash = name.rfind('/');
-  std::string folder = slash == std::string::npos ? "." : (slash == 0 ? "/" : name.substr(0, slash));
-  std::string base = slash == std::string::npos ? name : name.substr(slash + 1);
+  std::string folder, base;
+  vxfiles::SplitPath(name, folder, base);
   int dirFd = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
   if (dirFd < 0) return -1;
   std::string temp;
   int fd = vxfiles::CreateTempFileAt(dirFd, base.c_str(), exists ? 0600 : permissions, temp);
   close(dirFd);
   if (fd < 0) return -1;
-  tempName = slash == std::string::npos ? temp : folder + "/" + temp;
+  tempName = folder + "/" + temp;
   if (exists) {
     // Owner first: a change of owner clears the set-id bits that the mode then restores.
     if (fchown(fd, st.st_uid, st.st_gid) != 0) {

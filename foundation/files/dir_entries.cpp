@@ -44,7 +44,8 @@ bool ReadDirEntries(int fd, std::vector<DirEntry>& entries, std::vector<char>& b
       memcpy(&type, record + offsetof(struct dirent64, d_type), sizeof type);
       if (length == 0) return false;  // a corrupt record would loop forever
       const char* name = record + offsetof(struct dirent64, d_name);
-      size_t nameLength = strnlen(name, static_cast<size_t>(length) - offsetof(struct dirent64, d_name));
+      size_t room = static_cast<size_t>(length) - offsetof(struct dirent64, d_name);
+      size_t nameLength = strnlen(name, room);
       offset += length;
       if (nameLength == 0) continue;
       if (name[0] == '.' && (nameLength == 1 || (nameLength == 2 && name[1] == '.'))) continue;
@@ -72,5 +73,16 @@ bool NameMatches(const char* pattern, const char* name) {
 }
 
 bool HasWildcard(const char* pattern) { return strpbrk(pattern, "*?[") != nullptr; }
+
+void SplitPath(const std::string& path, std::string& folder, std::string& name) {
+  size_t slash = path.rfind('/');
+  if (slash == std::string::npos) {
+    folder = ".";
+    name = path;
+    return;
+  }
+  folder = slash == 0 ? "/" : path.substr(0, slash);
+  name = path.substr(slash + 1);
+}
 
 }  // namespace vxfiles

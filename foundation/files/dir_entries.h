@@ -34,6 +34,9 @@ bool NameMatches(const char* pattern, const char* name);
 // True when the pattern holds a wildcard character, i.e. names a set rather than one entry.
 bool HasWildcard(const char* pattern);
 
+// Splits a path at its last '/': folder "." for a bare name, "/" for a name in the root.
+void SplitPath(const std::string& path, std::string& folder, std::string& name);
+
 // A folder's identity, to recognise the same folder reached twice (bind mounts, copying a tree
 // into itself).
 typedef std::pair<dev_t, ino_t> FolderId;

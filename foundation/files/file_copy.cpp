@@ -301,9 +301,8 @@ FolderId IdOf(int fd) {
 
 // A single file: to is the destination file's path.
 int CopySingleFile(CopyJob& job, const std::string& from, const std::string& to) {
-  size_t slash = to.rfind('/');
-  std::string name = slash == std::string::npos ? to : to.substr(slash + 1);
-  std::string parent = slash == std::string::npos ? "." : (slash == 0 ? "/" : to.substr(0, slash));
+  std::string parent, name;
+  vxfiles::SplitPath(to, parent, name);
   if (name.empty()) return 1;
   // The source is opened first, so a missing or unreadable one leaves no trace at the destination.
   Source src;
@@ -350,10 +349,9 @@ int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to)
   int srcFd = open(from.c_str(), kOpenFolder);
   if (srcFd < 0) {
     int error = errno;
-    size_t slash = from.rfind('/');
-    std::string last = slash == std::string::npos ? from : from.substr(slash + 1);
+    std::string folder, last;
+    vxfiles::SplitPath(from, folder, last);
     if (error == ENOENT && vxfiles::HasWildcard(last.c_str())) {
-      std::string folder = slash == std::string::npos ? "." : (slash == 0 ? "/" : from.substr(0, slash));
       return CopyMatchingFiles(job, folder, last, to);
     }
     if (error != ENOTDIR || last.empty()) return 1;

@@ -110,13 +110,10 @@ bool ResolveReplaceTarget(const std::string& path, ReplaceTarget* target) {
     return true;
   }
   target->path = path;
-  if (S_ISLNK(st.st_mode)) {
-    char* resolved = realpath(path.c_str(), nullptr);  // fails for a dangling link or a loop
-    if (resolved == nullptr) return false;
-    target->path = resolved;
-    free(resolved);
-    if (stat(target->path.c_str(), &st) != 0) return false;
-  }
+  // A link is replaced by the file, never written through: a copied link may point into the source
+  // installation, which a migration must not change. The file takes the mode of what the link
+  // pointed to; a dangling link or a loop is refused.
+  if (S_ISLNK(st.st_mode) && stat(path.c_str(), &st) != 0) return false;
   if (!S_ISREG(st.st_mode)) return false;
   target->exists = true;
   target->mode = st.st_mode & 07777;

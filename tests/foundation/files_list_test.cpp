@@ -31,57 +31,32 @@ std::vector<std::string> Folders(const std::string& folder, unsigned int recursi
   return names;
 }
 
-class Listing : public testing::Test {
- protected:
-  void SetUp() override {
-    for (const char* name : {"b.so", "a.so", "B.so", "readme", ".hidden.so", "plugin.so.bak",
-                             "x.ini", "sub dir/inner.so"}) {
-      vxtest::WriteFile(tmp_.Path(name), name);
-    }
-  }
-  vxtest::TempDir tmp_;
-};
-
-TEST_F(Listing, FilesComeSortedBytewiseWithFullPathsAndNoFolders) {
-  vxFileInfoList list;
-  vxFileManager::GetFileList((tmp_.path() + "/").c_str(), "*", list, 1);
-  std::vector<std::string> paths;
-  for (const vxFileInfo& info : list) paths.push_back(info.GetFilename().Pathname().str());
-  std::vector<std::string> expected;
-  for (const char* name : {".hidden.so", "B.so", "a.so", "b.so", "plugin.so.bak", "readme", "x.ini"}) {
-    expected.push_back(tmp_.path() + "/" + name);
-  }
-  EXPECT_EQ(expected, paths);
-}
-
 struct PatternCase {
   const char* pattern;
   std::vector<std::string> expected;
 };
 
-class ListingPattern : public Listing, public testing::WithParamInterface<PatternCase> {};
+class FileListPattern : public testing::TestWithParam<PatternCase> {};
 
-TEST_P(ListingPattern, MatchesLikeAShell) {
-  EXPECT_EQ(GetParam().expected, FileNames(tmp_.path(), GetParam().pattern, 0));
+TEST_P(FileListPattern, ListsMatchingFilesSortedBytewise) {
+  vxtest::TempDir tmp;
+  for (const char* name : {"b.so", "a.so", "B.so", "readme", ".hidden.so", "plugin.so.bak",
+                           "x.ini", "folder.so/inner.so"}) {
+    vxtest::WriteFile(tmp.Path(name), name);
+  }
+  EXPECT_EQ(GetParam().expected, FileNames(tmp.path(), GetParam().pattern, 1));
 }
 
 const std::vector<std::string> kAllFiles = {".hidden.so", "B.so", "a.so", "b.so",
                                             "plugin.so.bak", "readme", "x.ini"};
 
 INSTANTIATE_TEST_SUITE_P(
-    Patterns, ListingPattern,
+    Patterns, FileListPattern,
     testing::Values(PatternCase{"*.so", {".hidden.so", "B.so", "a.so", "b.so"}},
                     PatternCase{"*.*", kAllFiles},  // names without a dot too
-                    PatternCase{"*", kAllFiles}, PatternCase{"", kAllFiles},
+                    PatternCase{"", kAllFiles},
                     PatternCase{"*.INI", {}},  // case counts
-                    PatternCase{"?.so", {"B.so", "a.so", "b.so"}},
                     PatternCase{"[ab].so", {"a.so", "b.so"}}));
-
-TEST(FileList, MissingFolderGivesAnEmptyList) {
-  vxFileInfoList list;
-  EXPECT_EQ(0, vxFileManager::GetFileList("/nonexistent/vxm/folder", "*", list, 1));
-  EXPECT_TRUE(list.empty());
-}
 
 TEST(FileList, FollowLinksDecidesHowLinksAreListed) {
   vxtest::TempDir tmp;
@@ -93,18 +68,20 @@ TEST(FileList, FollowLinksDecidesHowLinksAreListed) {
   ASSERT_EQ(0, mkfifo(tmp.Path("pipe.ini").c_str(), 0600));
 
   vxFileInfoList followed;
-  vxFileManager::GetFileList(tmp.path().c_str(), "*.ini", followed, 1);
+  vxFileManager::GetFileList((tmp.path() + "/").c_str(), "*.ini", followed, 1);
   ASSERT_EQ(2u, followed.size());
-  EXPECT_EQ("link.ini", followed[0].GetFilename().Filename().str());
+  EXPECT_EQ(tmp.path() + "/link.ini", followed[0].GetFilename().Pathname().str());
   EXPECT_TRUE(followed[0].IsRegular());
-
   EXPECT_EQ((std::vector<std::string>{"dangling.ini", "folderlink.ini", "link.ini", "real.ini"}),
             FileNames(tmp.path(), "*.ini", 0));
+  EXPECT_TRUE(FileNames(tmp.Path("missing"), "*", 0).empty());
 }
 
 TEST(FolderList, RecursiveListingIsDepthFirstAndSortedAtEachLevel) {
   vxtest::TempDir tmp;
-  for (const char* folder : {"b", "a/z", "a/b/c", "a b", "c.dat"}) vxtest::MakeDirs(tmp.Path(folder));
+  for (const char* folder : {"b", "a/z", "a/b/c", "a b", "c.dat"}) {
+    vxtest::MakeDirs(tmp.Path(folder));
+  }
   vxtest::WriteFile(tmp.Path("a/file"), "not a folder");
   EXPECT_EQ((std::vector<std::string>{"a", "a/b", "a/b/c", "a/z", "a b", "b", "c.dat"}),
             Folders(tmp.path(), 1, 0));

@@ -152,21 +152,24 @@ TEST(IniFile, CloseWithoutSavingLeavesTheFileAndEndsTheSession) {
   EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("a.ini")));
 }
 
-TEST(IniFile, WritingKeepsModeAndLinkAndLeavesNoTemporaryFile) {
+TEST(IniFile, WritingReplacesALinkAndNeverWritesThroughIt) {
+  // A settings file copied as a link may point into the source installation: the link is replaced
+  // by the new file and what it pointed to stays as it was.
   vxtest::TempDir dir;
-  WriteFile(dir.Path("real.ini"), "[a]\nk=1\n");
-  chmod(dir.Path("real.ini").c_str(), 0640);
-  ASSERT_EQ(0, symlink("real.ini", dir.Path("link.ini").c_str()));
+  WriteFile(dir.Path("source.ini"), "[a]\nk=1\n");
+  chmod(dir.Path("source.ini").c_str(), 0640);
+  ASSERT_EQ(0, symlink("source.ini", dir.Path("link.ini").c_str()));
   vxMappedINIFile ini(dir.Path("link.ini").c_str());
   ASSERT_EQ(0, ini.Open(1));
   ini.SetVal("a", "k", "2");
   ASSERT_EQ(0, ini.CloseFW(1));
-  EXPECT_EQ("[a]\nk=2\n", ReadFile(dir.Path("real.ini")));
-  EXPECT_EQ(0640u, FileMode(dir.Path("real.ini")));
+  EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("source.ini")));
+  EXPECT_EQ("[a]\nk=2\n", ReadFile(dir.Path("link.ini")));
+  EXPECT_EQ(0640u, FileMode(dir.Path("link.ini")));
   struct stat st;
   ASSERT_EQ(0, lstat(dir.Path("link.ini").c_str(), &st));
-  EXPECT_TRUE(S_ISLNK(st.st_mode));
-  EXPECT_EQ((std::vector<std::string>{"link.ini", "real.ini"}), Names(dir.path()));
+  EXPECT_TRUE(S_ISREG(st.st_mode));
+  EXPECT_EQ((std::vector<std::string>{"link.ini", "source.ini"}), Names(dir.path()));
 }
 
 // A disk that fills up mid-write, played by a file-size limit (which binds root too).
