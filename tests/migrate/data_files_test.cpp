@@ -37,26 +37,17 @@ INSTANTIATE_TEST_SUITE_P(
     ::testing::Values(
         MergeCase{"FieldsAPrefixOfALine", "x\na,b,c\n", "a,b\n", "x\na,b,c\n"},
         MergeCase{"MoreFieldsThanTheLine", "a,b\n", "a,b,c\n", "a,b\na,b,c"},
-        MergeCase{"FieldsCompareWhole", "ab,c\n", "a\n", "ab,c\na"},
         MergeCase{"EmptyFieldsKeepTheirPlace", "a\n", "a,\n", "a\na,"},
-        MergeCase{"TrailingEmptyFieldOfTheLine", "a,\n", "a\n", "a,\n"},
-        MergeCase{"BytesCompareExactly", "Googlebot\n", "googlebot\n", "Googlebot\ngooglebot"},
         MergeCase{"FirstEmptyLineEndsTheMerge", "a\n", "x\n\ny\n", "a\nx"},
         MergeCase{"RepeatedRecordAddedOnce", "a\n", "x\nx,1\nx\n", "a\nx\nx,1"},
         MergeCase{"LineFeedBeforeFirstAddedLine", "a", "b", "a\nb"},
-        MergeCase{"UnchangedWhenNothingAdded", "\n\n a \n\n", " a \n", "\n\n a \n\n"},
-        MergeCase{"EmptyDestinationLinesSkipped", "a\n\nb\n", "b\n", "a\n\nb\n"},
-        MergeCase{"EndsStrippedWhenAppending", "\n  a,b  \n\n", "c\n", "a,b\nc"},
         // The stripped line is what later records compare with.
         MergeCase{"StrippedLineMatchesLaterRecords", "a,b  \n", "c\na,b\n", "a,b\nc"},
-        MergeCase{"UnstrippedLineDoesNot", "a,b  \n", "a,b\nc\n", "a,b\na,b\nc"},
-        MergeCase{"WhiteRecordStrippedByTheNext", "a\n", " \nb\n", "a\nb"},
         MergeCase{"EmptyDestinationGainsALineFeed", "", "a\n", "\na"},
-        MergeCase{"WhiteDestination", " \r\n\t", "a\nb\n", "a\nb"},
         MergeCase{"CrlfLinesKept", "a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
         MergeCase{"CrlfEmptyLineEndsTheMerge", "a\r\n", "x\r\n\r\ny\r\n", "a\nx"},
-        MergeCase{"OneCarriageReturnDropped", "a\r\r\n", "a\r\r\nb\r\r", "a\nb\r"},
-        MergeCase{"BinaryBytesCompared", std::string("a\0b\n", 4), "a\n", std::string("a\0b\na", 5)}),
+        MergeCase{"BinaryBytesCompared", std::string("a\0b\n", 4), "a\n",
+                  std::string("a\0b\na", 5)}),
     [](const ::testing::TestParamInfo<MergeCase>& info) { return info.param.name; });
 
 // The literal reading of the merge: every record compared with every line of the text as it
@@ -174,15 +165,6 @@ TEST(DataFileMerge, InPlaceRunReadsAndWritesNothing) {
   EXPECT_EQ(0, run->manager().DoMergeCSVFile("refs.txt", "refs.txt"));
   EXPECT_EQ("a", ReadFile(run->Dst("refs.txt")));
   EXPECT_TRUE(run->Logged().empty());
-}
-
-TEST(DataFileMerge, SourceAndDestinationNamesMayDiffer) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Src("old/robots.txt"), "r1\nr2\n");
-  WriteFile(run.Dst("new/spiders.txt"), "r2\n");
-  EXPECT_EQ(0, run.manager().DoMergeCSVFile("old/robots.txt", "new/spiders.txt"));
-  EXPECT_EQ("r2\nr1", ReadFile(run.Dst("new/spiders.txt")));
-  EXPECT_EQ("r1\nr2\n", ReadFile(run.Src("old/robots.txt")));
 }
 
 }  // namespace

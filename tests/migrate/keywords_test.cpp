@@ -6,21 +6,10 @@
 #include <string>
 #include <vector>
 
-#include "foundation/inifile/ini_file.h"
 #include "migrate/settings_fixture.h"
 
 namespace vxtest {
 namespace {
-
-std::vector<std::string> SectionLines(const std::string& path, const char* section) {
-  vxMappedINIFile file(path.c_str());
-  std::vector<std::string> lines;
-  if (file.Open(1) != 0) return {"<unreadable>"};
-  const INILineList* list = file.GetPropertyList(section);
-  if (list == nullptr) return {"<none>"};
-  for (const INILine* line : *list) lines.push_back(line->m_key.str() + "=" + line->m_value.str());
-  return lines;
-}
 
 const char kNewKeywords[] =
     "; search engines of this installation\n"

@@ -6,7 +6,6 @@
 #include <string>
 #include <vector>
 
-#include "foundation/inifile/ini_file.h"
 #include "migrate/settings_fixture.h"
 
 namespace vxtest {
@@ -14,17 +13,6 @@ namespace {
 
 const char kLogSettings[] = "vxm_log/vxm_log.ini";
 const char kConverted[] = "New-style cookie created in vxm_log.ini";
-
-// "key=value" for each property of a section, in file order; empty when the section is absent.
-std::vector<std::string> SectionLines(const std::string& path, const char* section) {
-  vxMappedINIFile file(path.c_str());
-  std::vector<std::string> lines;
-  if (file.Open(1) != 0) return {"<unreadable>"};
-  const INILineList* list = file.GetPropertyList(section);
-  if (list == nullptr) return lines;
-  for (const INILine* line : *list) lines.push_back(line->m_key.str() + "=" + line->m_value.str());
-  return lines;
-}
 
 std::string OldCookie(const std::string& validate, const std::string& plugin, const char* eol) {
   std::string text = std::string("[Defaults]") + eol + "MaxTopCount=100" + eol + "[Cookie]" + eol +
@@ -67,7 +55,6 @@ INSTANTIATE_TEST_SUITE_P(
     ::testing::Values(
         CookieCase{"NamedCookie", "1", "0",
                    {"Name=Default Cookie", "Enabled=1", "Type=2", "Key=SID"}},
-        CookieCase{"NamedCookieWithoutFlags", "", "", {"Name=Default Cookie", "Enabled=1", "Type=2", "Key=SID"}},
         CookieCase{"NotValidated", "0", "1", {"Name=Default Cookie", "Enabled=1", "Type=0"}},
         CookieCase{"ProductPlugin", "1", "1", {"Name=Default Cookie", "Enabled=1", "Type=1"}}),
     [](const ::testing::TestParamInfo<CookieCase>& info) { return info.param.name; });
@@ -111,14 +98,11 @@ TEST_P(CookieVersionGate, ConvertsOnlyFromBeforeToAfterTheMiddleOfALine) {
 INSTANTIATE_TEST_SUITE_P(
     Cases, CookieVersionGate,
     ::testing::Values(GateCase{"From50To55", "pavsuite", "pavsuite", "5.0", "5.5", true},
-                      GateCase{"From40To57", "halsuite", "pavsuite", "4.0", "5.7", true},
                       GateCase{"From55To60", "pavsuite", "pavsuite", "5.5", "6.0", false},
                       GateCase{"From45To55", "pavsuite", "pavsuite", "4.5", "5.5", false},
                       GateCase{"From47To55", "pavsuite", "pavsuite", "4.7", "5.5", false},
                       GateCase{"From50To60", "pavsuite", "pavsuite", "5.0", "6.0", false},
-                      GateCase{"From60To65", "pavsuite", "pavsuite", "6.0", "6.5", false},
                       GateCase{"LogFrom60To65", "log", "log", "6.0", "6.5", true},
-                      GateCase{"LogFrom70To75", "log", "log", "7.0", "7.5", false},
                       GateCase{"IntoLog55", "pavsuite", "log", "5.0", "5.5", false},
                       GateCase{"FromLog60IntoPav55", "log", "pavsuite", "6.0", "5.5", true}),
     [](const ::testing::TestParamInfo<GateCase>& info) { return info.param.name; });
@@ -163,13 +147,10 @@ INSTANTIATE_TEST_SUITE_P(
                       LimitCase{"Small", "MaxTopCount=250\n", "1000"},
                       LimitCase{"BetweenThousands", "MaxTopCount=2500\n", "3000"},
                       LimitCase{"ExactThousandMovesUp", "MaxTopCount=3000\n", "4000"},
-                      LimitCase{"JustBelowTheTop", "MaxTopCount=98999\n", "99000"},
                       LimitCase{"TopItself", "MaxTopCount=99000\n", "99000"},
                       LimitCase{"Large", "MaxTopCount=150000\n", "150000"},
-                      LimitCase{"Zero", "MaxTopCount=0\n", "1000"},
                       LimitCase{"Negative", "MaxTopCount=-2500\n", "1000"},
                       LimitCase{"Garbage", "MaxTopCount=lots\n", "1000"},
-                      LimitCase{"DigitsThenGarbage", "MaxTopCount=2500rows\n", "3000"},
                       LimitCase{"HugeIsHeld", "MaxTopCount=99999999999999999999\n", "1000000"}),
     [](const ::testing::TestParamInfo<LimitCase>& info) { return info.param.name; });
 

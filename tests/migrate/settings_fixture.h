@@ -4,26 +4,47 @@
 #ifndef VXMIGRATE_TESTS_MIGRATE_SETTINGS_FIXTURE_H_
 #define VXMIGRATE_TESTS_MIGRATE_SETTINGS_FIXTURE_H_
 
+#include <algorithm>
 #include <memory>
 #include <string>
 #include <vector>
 
+#include "foundation/inifile/ini_file.h"
+#include "migrate/driver_fixture.h"
 #include "migrate/manager.h"
 #include "support/test_files.h"
 
 namespace vxtest {
 
+// "key=value" for each property of a section of an INI file, in file order; {"<none>"} when the
+// section is absent.
+inline std::vector<std::string> SectionLines(const std::string& path, const std::string& section) {
+  vxMappedINIFile file(path.c_str());
+  if (file.Open(1) != 0) return {"<unreadable>"};
+  const INILineList* list = file.GetPropertyList(section.c_str());
+  if (list == nullptr) return {"<none>"};
+  std::vector<std::string> lines;
+  for (const INILine* line : *list) lines.push_back(line->m_key.str() + "=" + line->m_value.str());
+  return lines;
+}
+
 class SettingsRun {
  public:
   // A side-by-side run "<tmp>/src" -> "<tmp>/dst" between the given products and versions.
   SettingsRun(const std::string& p1, const std::string& p2, const std::string& v1,
-              const std::string& v2)
-      : SettingsRun(p1, p2, v1, v2, false) {}
-
-  // inPlace: both folders are "<tmp>/inst".
+              const std::string& v2, bool inPlace = false)
+      : source_(root_.Path(inPlace ? "inst" : "src")),
+        destination_(root_.Path(inPlace ? "inst" : "dst")) {
+    MakeDirs(source_);
+    MakeDirs(destination_);
+    manager_ = MakeManager({root_.Path("vxmigrate"), "-D1:" + source_, "-D2:" + destination_,
+                            "-P1:" + p1, "-P2:" + p2, "-V1:" + v1, "-V2:" + v2});
+    header_ = LogEntries(destination_ + "/vxmigrate.log").size();
+  }
+  // Both folders are "<tmp>/inst".
   static std::unique_ptr<SettingsRun> InPlace(const std::string& p1, const std::string& p2,
                                               const std::string& v1, const std::string& v2) {
-    return std::unique_ptr<SettingsRun>(new SettingsRun(p1, p2, v1, v2, true));
+    return std::make_unique<SettingsRun>(p1, p2, v1, v2, true);
   }
 
   SettingsRun(const SettingsRun&) = delete;
@@ -36,29 +57,11 @@ class SettingsRun {
   // Entries the operations logged, in order.
   std::vector<std::string> Logged() const {
     std::vector<std::string> all = LogEntries(destination_ + "/vxmigrate.log");
-    if (all.size() <= header_) return {};
-    return std::vector<std::string>(all.begin() + static_cast<long>(header_), all.end());
+    all.erase(all.begin(), all.begin() + static_cast<long>(std::min(header_, all.size())));
+    return all;
   }
 
  private:
-  SettingsRun(const std::string& p1, const std::string& p2, const std::string& v1,
-              const std::string& v2, bool inPlace)
-      : source_(root_.Path(inPlace ? "inst" : "src")),
-        destination_(root_.Path(inPlace ? "inst" : "dst")) {
-    MakeDirs(source_);
-    MakeDirs(destination_);
-    MakeDirs(root_.Path("bin"));
-    std::vector<std::string> args = {root_.Path("bin/vxmigrate"), "-D1:" + source_,
-                                     "-D2:" + destination_,       "-P1:" + p1,
-                                     "-P2:" + p2,                 "-V1:" + v1,
-                                     "-V2:" + v2};
-    std::vector<char*> argv;
-    for (std::string& arg : args) argv.push_back(&arg[0]);
-    argv.push_back(nullptr);
-    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
-    header_ = LogEntries(destination_ + "/vxmigrate.log").size();
-  }
-
   TempDir root_;
   std::string source_;
   std::string destination_;
