@@ -1,0 +1,120 @@
+// Copies user files of one folder into the destination as marked copies ("report_vxmigrate.wlp"),
+// and scheduled events with them, each event pointed at the marked copy of the file it works on or
+// dropped when that file did not come along. A marked copy already in the destination is never
+// replaced. Results are always 0; nothing is done in an in-place migration.
+
+#include "foundation/files/file_info.h"
+#include "foundation/files/file_manager.h"
+#include "foundation/inifile/ini_file.h"
+#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/marked_name.h"
+#include "migrate/manager.h"
+
+namespace {
+
+const char kEventSection[] = "Main";
+const char kSetNameKey[] = "SetName";
+const char kSetExtensionKey[] = "SetExtension";
+
+// What became of one scheduled event.
+enum class EventOutcome { kKept, kDropped, kUnreadable };
+
+// Points the event's "SetName" at the marked copy of its set when the name falls under prefix;
+// drops the event when that marked copy is not in the destination folder.
+EventOutcome RedirectEvent(const vxStringBase& eventPath, const vxStringBase& prefix,
+                           const vxStringBase& destinationFolder) {
+  vxMappedINIFile event(eventPath);
+  if (event.Open(0) != 0) return EventOutcome::kUnreadable;
+  vxStringBase setName = event.GetVal(kEventSection, kSetNameKey);
+  if (setName.isEmpty() || !setName.beginsWith(prefix.view(), true)) {
+    event.Close(0);  // nothing changed: the copy stays byte for byte
+    return EventOutcome::kKept;
+  }
+  vxStringBase markedName = MarkedBaseName(setName);
+  vxStringBase setFile(markedName);
+  setFile.append('.');
+  setFile.append(event.GetVal(kEventSection, kSetExtensionKey));
+  vxStringBase setPath;
+  vxFileManager::MakePath(setPath, destinationFolder, setFile, 1);
+  if (!vxFileManager::Exists(setPath)) {
+    event.Close(0);
+    return EventOutcome::kDropped;
+  }
+  event.SetVal(kEventSection, kSetNameKey, markedName);
+  return event.Close(1) == 0 ? EventOutcome::kKept : EventOutcome::kUnreadable;
+}
+
+}  // namespace
+
+int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pattern,
+                                             const char* extension, const char* exclusions) {
+  if (IsInPlaceMigrate()) return 0;
+  const vxStringBase relative(folder);
+  vxStringBase sourceFolder;
+  vxFileManager::MakePath(sourceFolder, m_sourceDirectory, relative, 0);
+
+  const vxExclusionSet excluded(*this, vxStringBase(exclusions), vxStringBase::NullStr, 0);
+  vxFileInfoList files;
+  vxFileManager::GetFileList(sourceFolder, pattern == nullptr ? "" : pattern, files, 0);
+  for (const vxFileInfo& file : files) {
+    vxStringBase name = file.GetFilename().Filename();
+    if (excluded.Contains(name)) continue;
+    vxStringBase destination;
+    vxFileManager::MakePath(destination, m_destinationDirectory, relative,
+                            MarkedFileName(name, vxStringBase(extension)));
+    vxStringBase source;
+    vxFileManager::MakePath(source, m_sourceDirectory, relative, name);
+    if (vxFileManager::Exists(destination)) {
+      Log("File exists - no copy made: ", destination.c_str());
+      continue;
+    }
+    // Logged as copied whatever the copy answered: the later steps look at what is there.
+    vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
+    Log("File copied:  ", destination.c_str());
+  }
+  return 0;
+}
+
+int vxMigrationManager::CopyScheduledEventFiles(const char* folder, const char* pattern,
+                                                const char* extension, const char* namePattern) {
+  if (IsInPlaceMigrate()) return 0;
+  vxStringBase prefix(namePattern);
+  prefix.cut(1);  // the trailing wildcard
+  const vxStringBase relative(folder);
+  vxStringBase sourceFolder;
+  vxFileManager::MakePath(sourceFolder, m_sourceDirectory, relative, 0);
+  vxStringBase destinationFolder;
+  vxFileManager::MakePath(destinationFolder, m_destinationDirectory, relative, 0);
+
+  vxFileInfoList files;
+  vxFileManager::GetFileList(sourceFolder, pattern == nullptr ? "" : pattern, files, 0);
+  for (const vxFileInfo& file : files) {
+    vxStringBase name = file.GetFilename().Filename();
+    vxStringBase source;
+    vxFileManager::MakePath(source, m_sourceDirectory, relative, name);
+    vxStringBase copy;
+    vxFileManager::MakePath(copy, m_destinationDirectory, relative,
+                            MarkedFileName(name, vxStringBase(extension)));
+    if (vxFileManager::Exists(copy)) {
+      // An earlier run's event, possibly edited since: it stays as it is.
+      Log("File exists - no copy made:  ", copy.c_str());
+      continue;
+    }
+    if (vxFileManager::CopyFile(source, copy, 0, 1, 0, 0, 0, nullptr, nullptr) != 0) {
+      Log("Error: Schedule Event could not be copied: ", source.c_str());
+      continue;
+    }
+    switch (RedirectEvent(copy, prefix, destinationFolder)) {
+      case EventOutcome::kKept:
+        Log("Schedule Event copied:  ", copy.c_str());
+        break;
+      case EventOutcome::kDropped:
+        vxFileManager::DeleteFile(copy, 0);
+        break;
+      case EventOutcome::kUnreadable:
+        Log("Error: Schedule Event could not be rewritten - left as copied: ", copy.c_str());
+        break;
+    }
+  }
+  return 0;
+}
