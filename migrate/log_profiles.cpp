@@ -164,6 +164,9 @@ int vxMigrationManager::DoCopyLogProfiles(const char* folder, const char* patter
 
 int vxMigrationManager::DoCopyLinkProfiles(const char* folder, const char* pattern,
                                            const char* extension, const char* fixedList) {
+  // In place nothing is copied, so merging the categories would only enter marked copies that
+  // were never made.
+  if (IsInPlaceMigrate()) return 0;
   const vxStringBase selection = m_cmdLineParser->GetValue("PFLink");
   const vxStringBase exclusions = MakeProfileExclusions(*this, selection, folder, extension, fixedList);
   CopyRenamedUserFiles(folder, pattern, extension, exclusions.c_str());
