@@ -9,7 +9,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/manager.h"
@@ -76,7 +76,7 @@ int vxMigrationManager::DoCopyAlertProfiles(const char* folder, const char* patt
   vxStringBase destinationFolder;
   vxFileManager::MakePath(destinationFolder, m_destinationDirectory, relative, 0);
   // Only the samples are left behind here; the user's selection counts for the categories alone.
-  const vxExclusionSet samples(*this, vxStringBase(fixedList), vxStringBase::NullStr, 0);
+  const vxExclusionIndex samples(*this, vxStringBase(fixedList), vxStringBase::NullStr, 0);
 
   vxFileInfoList files;
   vxFileManager::GetFileList(sourceFolder, pattern == nullptr ? "" : pattern, files, 0);

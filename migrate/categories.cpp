@@ -14,7 +14,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/manager.h"
 
@@ -170,7 +170,7 @@ class CategoriesMerge {
   vxMappedINIFile& source_;
   vxMappedINIFile& destination_;
   const vxStringBase profileFolder_;
-  const vxExclusionSet excluded_;
+  const vxExclusionIndex excluded_;
   const bool keepNames_;
   std::unordered_map<std::string, std::unordered_set<std::string>> paths_;
 };

@@ -1,7 +1,8 @@
-// Copies files and folders from the source installation into the destination. No operation here
-// replaces an existing destination file unless its caller's option asks for it, and in an in-place
-// run (source folder equal to destination folder) every operation does nothing and returns 0.
-// A file that cannot be copied costs one "Error: " line and the walk goes on with the rest.
+// Copies files and folders from the source installation into the destination. The whole-tree
+// copies never replace an existing destination file; CopyFilesOfType replaces one when its option
+// is set, CopyFiles and CopyFilesInRelativeFolder always (or, with their option, only an older
+// one). In an in-place run (source folder equal to destination folder) every operation does
+// nothing and returns 0. A file that cannot be copied costs one "Error: " line; the rest go on.
 
 #include <sys/stat.h>
 #include <unistd.h>

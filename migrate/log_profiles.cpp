@@ -12,7 +12,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/manager.h"
@@ -43,7 +43,7 @@ void CopyDataFolders(vxMigrationManager& manager, const vxStringBase& folder,
   vxFileManager::MakePath(sourceFolder, manager.GetSourceDirectory(), folder, 0);
   vxStringBase destinationFolder;
   vxFileManager::MakePath(destinationFolder, manager.GetDestinationDirectory(), folder, 0);
-  const vxExclusionSet excluded(manager, exclusions, extension, 0);
+  const vxExclusionIndex excluded(manager, exclusions, extension, 0);
 
   std::vector<vxStringBase> dataFolders;
   vxFileManager::GetFolderList(sourceFolder, "", dataFolders, 0, 0);
@@ -164,6 +164,9 @@ int vxMigrationManager::DoCopyLogProfiles(const char* folder, const char* patter
 
 int vxMigrationManager::DoCopyLinkProfiles(const char* folder, const char* pattern,
                                            const char* extension, const char* fixedList) {
+  // In place nothing is copied, so merging the categories would only enter marked copies that
+  // were never made.
+  if (IsInPlaceMigrate()) return 0;
   const vxStringBase selection = m_cmdLineParser->GetValue("PFLink");
   const vxStringBase exclusions = MakeProfileExclusions(*this, selection, folder, extension, fixedList);
   CopyRenamedUserFiles(folder, pattern, extension, exclusions.c_str());

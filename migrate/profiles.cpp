@@ -10,7 +10,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
 #include "foundation/string/tokenizer.h"
-#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -56,7 +56,7 @@ int vxMigrationManager::CopyAllProfilesOfType(const vxStringBase& extension,
   // The top folder is visited last, after every folder below it.
   folders.emplace_back(std::string_view(&vxFileManager::m_slash, 1));
 
-  const vxExclusionSet excluded(*this, exclusions, vxStringBase::NullStr, 1);
+  const vxExclusionIndex excluded(*this, exclusions, vxStringBase::NullStr, 1);
   const bool copyDataFolders = CopiesProfileDataFolders();
   for (const vxStringBase& folder : folders) {
     vxStringBase sourceFolder;

@@ -16,60 +16,58 @@ namespace {
 const int kReportingServer = 20;  // "obx"
 const int kTradeServer = 21;      // "tqrs"
 
-struct ServerFacts {
-  const char* pidFile;  // "" for products without servers
+enum ServerKind { kEngine, kInterface };
+
+struct ServerRow {
+  int productID;
+  ServerKind kind;
+  const char* pidFileBefore31;  // versions before 3.1
+  const char* pidFileFrom31;
   const char* message;
 };
 
-ServerFacts EngineFacts(int productID, const vxVersionDescriptor& version) {
-  bool before31 = version < vxVersionDescriptor("3.1");
-  if (productID == kTradeServer) {
-    return {before31 ? "tqrs.pid" : "vxtq.pid",
-            "Error: Cannot migrate while Tradequill Engine Server is running - shut down to migrate"};
-  }
-  if (productID == kReportingServer) {
-    return {"vxrs.pid",
-            "Error: Cannot migrate while Halden Engine Server is running - shut down to migrate"};
-  }
-  return {"", ""};
-}
+const ServerRow kServers[] = {
+    {kTradeServer, kEngine, "tqrs.pid", "vxtq.pid",
+     "Error: Cannot migrate while Tradequill Engine Server is running - shut down to migrate"},
+    {kTradeServer, kInterface, "vxinterface.pid", "vxtq_ui.pid",
+     "Error: Cannot migrate while Tradequill Interface Server is running - shut down to migrate"},
+    {kReportingServer, kEngine, "vxrs.pid", "vxrs.pid",
+     "Error: Cannot migrate while Halden Engine Server is running - shut down to migrate"},
+    {kReportingServer, kInterface, "vxinterface.pid", "vxrs_ui.pid",
+     "Error: Cannot migrate while Halden Interface Server is running - shut down to migrate"},
+};
 
-ServerFacts InterfaceFacts(int productID, const vxVersionDescriptor& version) {
-  bool before31 = version < vxVersionDescriptor("3.1");
-  if (productID == kTradeServer) {
-    return {before31 ? "vxinterface.pid" : "vxtq_ui.pid",
-            "Error: Cannot migrate while Tradequill Interface Server is running - shut down to "
-            "migrate"};
+// 1 (and the server's message in the log) when the pid file of that server names a live process.
+// Products without servers look at the bare folder, which never reads as a pid.
+int CheckServerRunning(vxMigrationManager& manager, ServerKind kind, int productID,
+                       const vxVersionDescriptor& version, const vxStringBase& folder) {
+  const ServerRow* row = nullptr;
+  for (const ServerRow& candidate : kServers) {
+    if (candidate.productID == productID && candidate.kind == kind) row = &candidate;
   }
-  if (productID == kReportingServer) {
-    return {before31 ? "vxinterface.pid" : "vxrs_ui.pid",
-            "Error: Cannot migrate while Halden Interface Server is running - shut down to migrate"};
+  const char* pidFile = "";
+  if (row != nullptr) {
+    pidFile = version < vxVersionDescriptor("3.1") ? row->pidFileBefore31 : row->pidFileFrom31;
   }
-  return {"", ""};
+  vxStringBase path;
+  vxFileManager::MakePath(path, folder, pidFile, 1);
+  if (!manager.sendNullSignal(manager.readPid(path.c_str()))) return 0;
+  manager.Log(row != nullptr ? row->message : "");
+  return 1;
 }
 
 }  // namespace
 
 int vxMigrationManager::CheckEngineRunning(int productID, const vxVersionDescriptor& version,
                                            int which) {
-  ServerFacts facts = EngineFacts(productID, version);
-  vxStringBase path;
-  vxFileManager::MakePath(path, which == 0 ? m_destinationDirectory : m_sourceDirectory,
-                          facts.pidFile, 1);
-  if (!sendNullSignal(readPid(path.c_str()))) return 0;
-  Log(facts.message);
-  return 1;
+  return CheckServerRunning(*this, kEngine, productID, version,
+                            which == 0 ? m_destinationDirectory : m_sourceDirectory);
 }
 
 int vxMigrationManager::CheckInterfaceRunning(int productID, const vxVersionDescriptor& version,
                                               int which) {
-  ServerFacts facts = InterfaceFacts(productID, version);
-  vxStringBase path;
-  vxFileManager::MakePath(path, which == 0 ? m_destinationDirectory : m_sourceDirectory,
-                          facts.pidFile, 1);
-  if (!sendNullSignal(readPid(path.c_str()))) return 0;
-  Log(facts.message);
-  return 1;
+  return CheckServerRunning(*this, kInterface, productID, version,
+                            which == 0 ? m_destinationDirectory : m_sourceDirectory);
 }
 
 // The pid at the start of the file's first 19 bytes; -1 when the file cannot be read. Text that

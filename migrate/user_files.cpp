@@ -6,7 +6,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_set.h"
+#include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/manager.h"
 
@@ -53,7 +53,7 @@ int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pat
   vxStringBase sourceFolder;
   vxFileManager::MakePath(sourceFolder, m_sourceDirectory, relative, 0);
 
-  const vxExclusionSet excluded(*this, vxStringBase(exclusions), vxStringBase::NullStr, 0);
+  const vxExclusionIndex excluded(*this, vxStringBase(exclusions), vxStringBase::NullStr, 0);
   vxFileInfoList files;
   vxFileManager::GetFileList(sourceFolder, pattern == nullptr ? "" : pattern, files, 0);
   for (const vxFileInfo& file : files) {

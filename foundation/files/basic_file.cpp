@@ -17,6 +17,7 @@
 
 #include "foundation/files/dir_entries.h"
 #include "foundation/files/temp_file.h"
+#include "foundation/files/write_all.h"
 
 namespace {
 
@@ -117,19 +118,11 @@ int vxBasicFile::ReadAll(vxStringBase& text) {
 int vxBasicFile::Write(const vxStringBase& text, unsigned long& written) {
   written = 0;
   if (fd_ < 0) return 1;
-  const char* data = text.c_str();
-  size_t size = text.length();
-  while (size > 0) {
-    ssize_t n = write(fd_, data, size);
-    if (n < 0) {
-      if (errno == EINTR) continue;
-      writeFailed_ = true;  // a rewrite that missed bytes must not replace the old file
-      return 1;
-    }
-    data += n;
-    size -= static_cast<size_t>(n);
-    written += static_cast<unsigned long>(n);
+  if (!vxWriteAll(fd_, text.c_str(), text.length())) {
+    writeFailed_ = true;  // a rewrite that missed bytes must not replace the old file
+    return 1;
   }
+  written = text.length();
   return 0;
 }
 

@@ -21,6 +21,7 @@
 
 #include "foundation/files/dir_entries.h"
 #include "foundation/files/temp_file.h"
+#include "foundation/files/write_all.h"
 
 namespace {
 
@@ -117,19 +118,6 @@ Outcome CheckDestination(const CopyJob& job, int dstDirFd, const char* name, con
   return Newer(src.st.st_mtim, dst.st_mtim) ? Outcome::kCopied : Outcome::kLeftInPlace;
 }
 
-bool WriteAll(int fd, const char* data, size_t size) {
-  while (size > 0) {
-    ssize_t n = write(fd, data, size);
-    if (n < 0) {
-      if (errno == EINTR) continue;
-      return false;
-    }
-    data += n;
-    size -= static_cast<size_t>(n);
-  }
-  return true;
-}
-
 // Copies the content of in to out, both at their current offsets. The kernel copy serves the
 // bytes fstat promised; read(2) finishes whatever it could not, up to the real end of the file.
 bool CopyBytes(CopyJob& job, int in, int out, off_t size) {
@@ -155,7 +143,7 @@ bool CopyBytes(CopyJob& job, int in, int out, off_t size) {
       if (errno == EINTR) continue;
       return false;
     }
-    if (!WriteAll(out, job.copyBuffer.data(), static_cast<size_t>(n))) return false;
+    if (!vxWriteAll(out, job.copyBuffer.data(), static_cast<size_t>(n))) return false;
   }
 }
 

@@ -11,6 +11,8 @@
 #include <ctime>
 #include <string>
 
+#include "foundation/files/write_all.h"
+
 namespace {
 
 std::string TimeStamp() {
@@ -49,13 +51,6 @@ void vxLogFile::WriteEntry(const char* text, const char* text2) {
   if (text != nullptr) entry += text;
   if (text2 != nullptr) entry += text2;
   entry += '\n';
-  const char* data = entry.data();
-  size_t left = entry.size();
-  while (left > 0) {
-    ssize_t written = write(fd_, data, left);
-    if (written < 0 && errno == EINTR) continue;
-    if (written <= 0) return;  // a full disk loses the entry, never the run
-    data += written;
-    left -= static_cast<size_t>(written);
-  }
+  // A full disk loses the entry, never the run.
+  vxWriteAll(fd_, entry.data(), entry.size());
 }

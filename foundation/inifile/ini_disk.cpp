@@ -14,25 +14,14 @@
 #include <cstdint>
 #include <vector>
 
+#include "foundation/files/write_all.h"
+
 namespace vxini {
 namespace {
 
 // Offsets into the text are 32-bit.
 constexpr size_t kMaxFileSize = UINT32_MAX - 1;
 constexpr size_t kMaxTempBase = 200;
-
-bool WriteAll(int fd, const char* data, size_t size) {
-  while (size > 0) {
-    ssize_t n = write(fd, data, size);
-    if (n < 0) {
-      if (errno == EINTR) continue;
-      return false;
-    }
-    data += n;
-    size -= static_cast<size_t>(n);
-  }
-  return true;
-}
 
 // umask can only be read by setting it; the library runs on one thread, so the moment between the
 // two calls is harmless.
@@ -151,7 +140,7 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
 
 bool AtomicFileWriter::Append(std::string_view data) {
   if (failed_ || fd_ < 0) return false;
-  if (!WriteAll(fd_, data.data(), data.size())) failed_ = true;
+  if (!vxWriteAll(fd_, data.data(), data.size())) failed_ = true;
   return !failed_;
 }
 

@@ -142,23 +142,16 @@ TEST(VersionRanges, AcceptInclusiveBoundsAndReportAMissingFile) {
   EXPECT_EQ(1, manager->DoCheckVersions(halsuite, obx));
 }
 
-TEST(RunQuestions, InPlaceAndInlineAndFullNames) {
+TEST(RunQuestions, InPlaceAndInline) {
   TempDir root;
   MakeDirs(root.Path("same"));
   auto inPlace = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + root.Path("same"),
                               "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.5"});
-  EXPECT_TRUE(inPlace->IsInPlaceMigrate());
-  EXPECT_TRUE(inPlace->IsInlineMigrate());
+  EXPECT_TRUE(inPlace->IsInPlaceMigrate() && inPlace->IsInlineMigrate());
   EXPECT_EQ(root.Path("same/vxm_log/vxm_log.ini"),
             inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
-
-  auto sideBySide = MakeRun(root, "log", "log", "5.5", "6.0");
-  EXPECT_FALSE(sideBySide->IsInPlaceMigrate());
-  EXPECT_FALSE(sideBySide->IsInlineMigrate());  // another major number
-  EXPECT_EQ(root.Path("dst/vantix.ini"), sideBySide->GetFullDestinationFilename("\\vantix.ini").str());
-  EXPECT_EQ(0, sideBySide->DoBadMigration());
-  EXPECT_EQ("No functions exist for migration of specified products - check names, versions",
-            LogEntries(root.Path("dst/vxmigrate.log")).back());
+  auto sideBySide = MakeRun(root, "log", "log", "5.5", "6.0");  // another major number
+  EXPECT_FALSE(sideBySide->IsInPlaceMigrate() || sideBySide->IsInlineMigrate());
 }
 
 TEST(Executable, IsFoundFromTheProgramNameAsAShellWould) {

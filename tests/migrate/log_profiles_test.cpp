@@ -196,5 +196,19 @@ TEST(DoCopyLinkProfiles, CopiesTheSelectionWithoutDataFoldersOrCredentials) {
   EXPECT_EQ(std::string::npos, ReadFile(run.Dst("links/categories.ini")).find("a_vxmigrate"));
 }
 
+TEST(DoCopyLinkProfiles, LeavesAnInPlaceRunAlone) {
+  RunOptions options;
+  options.inPlace = true;
+  Installations run(options);
+  const std::string categories =
+      "[main]\nNumberOfCategories=1\nCategory1=Links\n[Links]\nNumberOfProfiles=1\n"
+      "Profile1=/old/links/a.llp\n";
+  WriteFile(run.Src("links/a.llp"), "[Profile]\n");
+  WriteFile(run.Src("links/categories.ini"), categories);
+  EXPECT_EQ(0, run.manager().DoCopyLinkProfiles("links", "*.llp", "llp", ""));
+  EXPECT_EQ(categories, ReadFile(run.Src("links/categories.ini")));
+  EXPECT_EQ(Entries{}, run.RunLog());
+}
+
 }  // namespace
 }  // namespace vxtest
