@@ -1,16 +1,17 @@
-// How the INI model answers lookups, refuses what it cannot read, protects files it did not load,
-// writes atomically, and merges one file into another with the destination's values winning.
+// The INI model on disk: a file opened, perhaps changed, and written back is byte-identical but for
+// the bytes a change must touch; what cannot be read as settings is refused and never replaced; a
+// file this object did not load is never replaced; writes are atomic.
 
-#include <dirent.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <algorithm>
+#include <array>
 #include <csignal>
 #include <functional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "foundation/inifile/ini_file.h"
@@ -20,257 +21,201 @@ namespace {
 
 using vxtest::ReadFile;
 using vxtest::WriteFile;
+using Names = std::vector<std::string>;
+using Ini = vxMappedINIFile;
 
-// The sorted names in a folder. readdir64, because on i386 plain readdir fails on file systems
-// with 64-bit directory offsets.
-std::vector<std::string> Names(const std::string& folder) {
-  std::vector<std::string> names;
-  if (DIR* dir = opendir(folder.c_str())) {
-    while (struct dirent64* entry = readdir64(dir)) {
-      std::string name = entry->d_name;
-      if (name != "." && name != "..") names.push_back(name);
-    }
-    closedir(dir);
-  }
-  std::sort(names.begin(), names.end());
-  return names;
-}
-
-mode_t FileMode(const std::string& path) {
-  struct stat st;
-  return stat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
-}
-
-// The content of a regular file, or its kind for anything else (reading a pipe would block).
-std::string Snapshot(const std::string& path) {
-  struct stat st;
-  if (lstat(path.c_str(), &st) != 0) return "<missing>";
-  if (!S_ISREG(st.st_mode)) return "<kind " + std::to_string(st.st_mode & S_IFMT) + ">";
-  chmod(path.c_str(), 0644);
-  std::string text = ReadFile(path);
-  chmod(path.c_str(), st.st_mode & 07777);
-  return text;
-}
-
-mode_t DefaultMode() {
-  mode_t mask = umask(0);
-  umask(mask);
-  return 0666 & ~mask;
-}
-
-TEST(IniFile, LookupsIgnoreCaseAndCreateNothing) {
-  vxtest::TempDir dir;
-  const std::string text = "[Main]\nKey = v \n[[Filter1]]\nName=f\n";
-  WriteFile(dir.Path("a.ini"), text);
-  vxMappedINIFile ini(dir.Path("a.ini").c_str());
-  ASSERT_EQ(0, ini.Open(1));
-  EXPECT_EQ("v", ini.GetVal("MAIN", "key").str());
-  EXPECT_EQ("f", ini.GetVal("[filter1]", "NAME").str());
-  EXPECT_EQ("f", ini.GetVal(ini.GetPropertyList("[Filter1]"), "name").str());
-  EXPECT_TRUE(ini.GetVal("absent", "Key").isEmpty());
-  EXPECT_TRUE(ini.GetVal("Main", "absent").isEmpty());
-  EXPECT_EQ(nullptr, ini.GetPropertyList("absent"));
-  EXPECT_EQ((std::vector<vxStringBase>{"Main", "[Filter1]"}), ini.GetSectionNames());
-  ASSERT_EQ(0, ini.Close(1));
-  EXPECT_EQ(text, ReadFile(dir.Path("a.ini")));
-}
-
-TEST(IniFile, NumberedWalkStopsAtFirstMissingKeyAndClearsTheOutput) {
-  vxtest::TempDir dir;
-  WriteFile(dir.Path("a.ini"), "[List]\nl0=a\nl1=\nl2=c\nl4=e\n");
-  vxMappedINIFile ini(dir.Path("a.ini").c_str());
-  ASSERT_EQ(0, ini.Open(0));
-  std::vector<std::string> seen;
-  vxStringBase value;
-  for (long n = 0; n < 100; ++n) {
-    vxStringBase key("l");
-    if (ini.GetVal("list", key.append(n), value) != 0) break;
-    seen.push_back(value.str());
-  }
-  EXPECT_EQ((std::vector<std::string>{"a", "", "c"}), seen);
-  EXPECT_TRUE(value.isEmpty());
-}
-
-struct OpenFailure {
+struct RewriteCase {
   const char* name;
-  std::function<void(const std::string& path)> make;
-  bool needsNonRoot;
+  std::string before;
+  std::function<void(Ini&)> edit = nullptr;  // none: the file is written back unchanged
+  std::string after = "";  // the file after the edit; empty: the same as before
+  unsigned int flag = 1;
 };
 
-class IniOpenFailure : public testing::TestWithParam<OpenFailure> {};
+class IniRewrite : public testing::TestWithParam<RewriteCase> {};
 
-// A file that cannot be read gives a non-zero Open and an empty object; Close(1) then creates a
-// missing file but never replaces whatever stands at the path.
-TEST_P(IniOpenFailure, LeavesObjectEmptyAndNeverReplacesWhatExists) {
-  if (GetParam().needsNonRoot && geteuid() == 0) GTEST_SKIP() << "root reads any file";
+TEST_P(IniRewrite, ChangesOnlyWhatWasChanged) {
+  const RewriteCase& c = GetParam();
   vxtest::TempDir dir;
-  std::string path = dir.Path("s.ini");
-  GetParam().make(path);
-  std::string before = Snapshot(path);
-  bool existed = vxtest::FileExists(path);
-  vxMappedINIFile ini(path.c_str());
-  EXPECT_NE(0, ini.Open(1));
-  EXPECT_FALSE(ini.IsLoaded());
-  EXPECT_TRUE(ini.GetSectionNames().empty());
-  ini.SetVal("s", "k", "v");
-  if (existed) {
-    EXPECT_EQ(1, ini.Close(1));
-    EXPECT_EQ(before, Snapshot(path));
-    EXPECT_EQ(std::vector<std::string>{"s.ini"}, Names(dir.path()));
-  } else {
-    EXPECT_EQ(0, ini.Close(1));
-    EXPECT_EQ("[s]\nk=v\n", ReadFile(path));
-    EXPECT_EQ(DefaultMode(), FileMode(path));
-  }
+  WriteFile(dir.Path("x.ini"), c.before);
+  Ini ini(dir.Path("x.ini").c_str());
+  ASSERT_EQ(0, ini.Open(c.flag));
+  if (c.edit) c.edit(ini);
+  ASSERT_EQ(0, ini.Close(1));
+  EXPECT_EQ(c.after.empty() ? c.before : c.after, ReadFile(dir.Path("x.ini")));
+}
+
+// Sets each section, key and value in turn.
+std::function<void(Ini&)> Set(std::vector<std::array<const char*, 3>> sets) {
+  return [sets](Ini& f) { for (const auto& s : sets) f.SetVal(s[0], s[1], s[2]); };
+}
+
+// Merges in a file holding text.
+std::function<void(Ini&)> MergeFrom(const std::string& text) {
+  return [text](Ini& f) {
+    vxtest::TempDir dir;
+    WriteFile(dir.Path("src.ini"), text);
+    Ini src(dir.Path("src.ini").c_str());
+    ASSERT_EQ(0, src.Open(1));
+    f.MergeFrom(src);
+  };
 }
 
 INSTANTIATE_TEST_SUITE_P(
-    Kinds, IniOpenFailure,
+    Files, IniRewrite,
     testing::Values(
-        OpenFailure{"Missing", [](const std::string&) {}, false},
-        OpenFailure{"Folder", [](const std::string& p) { vxtest::MakeDirs(p); }, false},
-        OpenFailure{"Binary", [](const std::string& p) { WriteFile(p, std::string("[a]\nk=\0\n", 8)); }, false},
-        OpenFailure{"Pipe", [](const std::string& p) { ASSERT_EQ(0, mkfifo(p.c_str(), 0644)); }, false},
-        OpenFailure{"Unreadable",
-                    [](const std::string& p) {
-                      WriteFile(p, "[a]\nk=v\n");
-                      chmod(p.c_str(), 0);
+        RewriteCase{"Empty", ""},
+        RewriteCase{"CrlfPreambleAndOddLines",
+                    "\xef\xbb\xbftop=1\r\n; note\r\n\r\n[m]\r\n  key  =  value \t\r\njust text\r\n"
+                    "\tk2\t=\tv2\r\n=novalue\r\n[oops\r\n[[Filter1]]\r\n[ sp ] ; [x]\r\n"},
+        RewriteCase{"MixedLoneCrNoFinalLineEnd", "[a]\rk=v\r\n\r\r\nx=y\nother=x\r\n[b]\nk=v"},
+        RewriteCase{"CommentsAroundAndLast", "; one\n# two\n\n[main]\nkey=value\n; closing"},
+        RewriteCase{"DupsAndNotUtf8", "[a]\nk=1\nK=2\n[A]\nk=3\n[m\xe9]\nk\xff=\xfe\xc3(\x80\n"},
+        RewriteCase{"TenMegabyteLine", "[a]\nbig=" + std::string(10 << 20, 'x') + "\n"},
+        // Lookups ignore case, tell an empty value from a missing key, and create nothing.
+        RewriteCase{"LookupsCreateNothing", "[Main]\nKey = v \nl0=\n[[Filter1]]\nName=f\n",
+                    [](Ini& f) {
+                      EXPECT_EQ("v", f.GetVal("MAIN", "key").str());
+                      EXPECT_EQ("f", f.GetVal(f.GetPropertyList("[filter1]"), "NAME").str());
+                      vxStringBase value("stale");
+                      EXPECT_EQ(0, f.GetVal("main", "L0", value));  // found, though empty
+                      EXPECT_TRUE(value.isEmpty());
+                      value = "stale";
+                      EXPECT_NE(0, f.GetVal("main", "l1", value));  // a numbered walk ends here
+                      EXPECT_TRUE(value.isEmpty() && f.GetVal("absent", "Key").isEmpty() &&
+                                  f.GetPropertyList("absent") == nullptr);
+                    }},
+        RewriteCase{"NulByteWithFlagZero", std::string("[a]\nk=v\0w\n", 10), nullptr, "", 0},
+        // Case ignored, spelling and spacing kept, the first of two keys set, new keys after the
+        // section's last property line, new lines ending like the file's own.
+        RewriteCase{"SetValChangesOnlyTheValue",
+                    "[Defaults]\r\n  Path  =  old ; x \r\nk = \r\nk=2\r\n; tail\r\n\r\n[b]\r\nz=1",
+                    Set({{"defaults", "PATH", "new"}, {"DEFAULTS", "K", "v"},
+                         {"defaults", "added", "n"}, {"c", "k", "w"}}),
+                    "[Defaults]\r\n  Path  =  new \r\nk = v\r\nk=2\r\nadded=n\r\n; tail\r\n\r\n"
+                    "[b]\r\nz=1\r\n[c]\r\nk=w\r\n"},
+        // A caller's text is written up to its first line break.
+        RewriteCase{"NewSectionAfterPreambleOnly", "; only a comment",
+                    Set({{"s", "n", "-42"}, {"s", "k", "x\n[evil]\nk=y"}, {"s", "", "v"}}),
+                    "; only a comment\n[s]\nn=-42\nk=x\n"},
+        RewriteCase{"RemovedKeysKeepComments", "[a]\n; about k\nk=1\nk=2\n; c\nlast=1\n\n[b]\n",
+                    [](Ini& f) {
+                      EXPECT_EQ(0, f.RemoveKey("a", "K"));
+                      EXPECT_EQ("2", f.GetVal("a", "k").str());  // the duplicate it hid
+                      EXPECT_EQ(0, f.RemoveKey("a", "last"));
                     },
-                    true}),
-    [](const testing::TestParamInfo<OpenFailure>& info) { return info.param.name; });
+                    "[a]\n; about k\nk=2\n; c\n\n[b]\n"},
+        RewriteCase{"DoubledBracketsRenamed", "[[Filter1]]\r\nk = 1 \r\n",
+                    [](Ini& f) { EXPECT_EQ(0, f.RenameSection("[filter1]", "Filter1")); },
+                    "[Filter1]\r\nk = 1 \r\n"},
+        // Updating sets values and adds keys (the first of a repeated key counts); adding keeps
+        // the section's own values; a value set through the line list is written in place.
+        RewriteCase{"MapSections", "[e]\na=1\nb=2\n[f]\nb=2\n[src]\nB=20\nc = 30\nc=31\n",
+                    [](Ini& f) {
+                      f.GetPropertyList("E")->at(0)->m_value = "9";
+                      f.UpdateMapSection("E", f.GetPropertyList("src"));
+                      f.AddMapSection("f", f.GetPropertyList("src"));
+                      f.AddMapSection("new", f.GetPropertyList("f"));
+                    },
+                    "[e]\na=9\nb=20\nc = 30\n[f]\nb=2\nc = 30\n[src]\nB=20\nc = 30\nc=31\n"
+                    "[new]\nb=2\nc = 30\n"},
+        // The destination's values win; new keys and sections come in the source's order, without
+        // the source's comments, ending like the destination's lines.
+        RewriteCase{"MergeKeepsDestinationValues", "[main]\nk=dest\n; end of main\n\n[dest]\nd=1\n",
+                    MergeFrom("[MAIN]\r\n; c\r\nK=src\r\nnew1 = a\r\nNEW1=dup\r\nnew2=b\r\n"
+                              "[other]\r\nx=1\r\n[Main]\r\nhidden=1\r\n[third]\r\n"),
+                    "[main]\nk=dest\nnew1 = a\nnew2=b\n; end of main\n\n[dest]\nd=1\n[other]\nx=1\n"
+                    "[third]\n"}),
+    [](const testing::TestParamInfo<RewriteCase>& info) { return info.param.name; });
 
-TEST(IniFile, CloseWithoutSavingLeavesTheFileAndEndsTheSession) {
-  vxtest::TempDir dir;
-  WriteFile(dir.Path("a.ini"), "[a]\nk=1\n");
-  vxMappedINIFile ini(dir.Path("a.ini").c_str());
-  ASSERT_EQ(0, ini.Open(1));
-  ini.SetVal("a", "k", "2");
-  ini.SetVal("b", "n", "3");
-  EXPECT_EQ(0, ini.Close(0));
-  // Nothing is loaded any more: a second Close(1) must not empty the file.
-  EXPECT_EQ(1, ini.Close(1));
-  EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("a.ini")));
+// Type and permission bits of whatever is at path (a link not followed); 0 when nothing is.
+mode_t FileMode(const std::string& path) {
+  struct stat st;
+  return lstat(path.c_str(), &st) == 0 ? st.st_mode : 0;
 }
 
+// The content of a regular file, else its type and mode (reading a pipe would block).
+std::string Snapshot(const std::string& path) {
+  return S_ISREG(FileMode(path)) ? ReadFile(path) : "<kind " + std::to_string(FileMode(path)) + ">";
+}
+
+// Whatever stands where a settings file should be but cannot be read as one is left as it was.
+TEST(IniFile, UnreadableFilesAreRefusedAndNeverReplaced) {
+  const std::pair<const char*, std::function<void(const std::string&)>> kinds[] = {
+      {"folder", [](const std::string& p) { vxtest::MakeDirs(p); }},
+      {"binary", [](const std::string& p) { WriteFile(p, std::string("[a]\nk=\0\n", 8)); }},
+      {"pipe", [](const std::string& p) { ASSERT_EQ(0, mkfifo(p.c_str(), 0644)); }}};
+  for (const auto& [kind, make] : kinds) {
+    SCOPED_TRACE(kind);
+    vxtest::TempDir dir;
+    make(dir.Path("s.ini"));
+    std::string before = Snapshot(dir.Path("s.ini"));
+    Ini ini(dir.Path("s.ini").c_str());
+    EXPECT_NE(0, ini.Open(1));
+    ini.SetVal("s", "k", "v");
+    EXPECT_EQ(1, ini.Close(1));
+    EXPECT_EQ(before, Snapshot(dir.Path("s.ini")));
+    EXPECT_EQ(Names{"s.ini"}, vxtest::ListTree(dir.path()));
+  }
+}
+
+TEST(IniFile, CloseCreatesAMissingFileButNeverReplacesOneItDidNotLoad) {
+  vxtest::TempDir dir;
+  WriteFile(dir.Path("a.ini"), "[a]\nk=1\n");
+  Ini ini(dir.Path("new.ini").c_str());
+  EXPECT_NE(0, ini.Open(1));
+  ini.SetVal("n", "k", "v");
+  EXPECT_EQ(0, ini.Close(1));
+  ini.SetFilename(dir.Path("a.ini").c_str());
+  ASSERT_EQ(0, ini.Open(1));
+  ini.SetVal("a", "k", "2");
+  EXPECT_EQ(0, ini.Close(0));
+  EXPECT_EQ(1, ini.Close(1));  // the changes were dropped and nothing is loaded any more
+  ASSERT_EQ(0, ini.Open(1));
+  ini.SetFilename(dir.Path("new.ini").c_str());
+  EXPECT_EQ(1, ini.Close(1));
+  ASSERT_EQ(0, ini.Open(1));  // new.ini, now loaded, may be saved under a new name
+  std::string longName = dir.Path(std::string(250, 'n') + ".ini");  // no room left for a suffix
+  ini.SetFilename(vxStringBase(longName.c_str()));
+  EXPECT_EQ(0, ini.Close(1));
+  EXPECT_EQ("[a]\nk=1\n" "[n]\nk=v\n" "[n]\nk=v\n",
+            ReadFile(dir.Path("a.ini")) + ReadFile(dir.Path("new.ini")) + ReadFile(longName));
+}
+
+// A settings file copied as a link may point into the source installation: the link is replaced
+// by a file with the old file's mode, and what it pointed to stays as it was.
 TEST(IniFile, WritingReplacesALinkAndNeverWritesThroughIt) {
-  // A settings file copied as a link may point into the source installation: the link is replaced
-  // by the new file and what it pointed to stays as it was.
   vxtest::TempDir dir;
   WriteFile(dir.Path("source.ini"), "[a]\nk=1\n");
   chmod(dir.Path("source.ini").c_str(), 0640);
   ASSERT_EQ(0, symlink("source.ini", dir.Path("link.ini").c_str()));
-  vxMappedINIFile ini(dir.Path("link.ini").c_str());
+  Ini ini(dir.Path("link.ini").c_str());
   ASSERT_EQ(0, ini.Open(1));
   ini.SetVal("a", "k", "2");
   ASSERT_EQ(0, ini.CloseFW(1));
   EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("source.ini")));
   EXPECT_EQ("[a]\nk=2\n", ReadFile(dir.Path("link.ini")));
-  EXPECT_EQ(0640u, FileMode(dir.Path("link.ini")));
-  struct stat st;
-  ASSERT_EQ(0, lstat(dir.Path("link.ini").c_str(), &st));
-  EXPECT_TRUE(S_ISREG(st.st_mode));
-  EXPECT_EQ((std::vector<std::string>{"link.ini", "source.ini"}), Names(dir.path()));
+  EXPECT_EQ(S_IFREG | 0640u, FileMode(dir.Path("link.ini")));
+  EXPECT_EQ((Names{"link.ini", "source.ini"}), vxtest::ListTree(dir.path()));
 }
 
 // A disk that fills up mid-write, played by a file-size limit (which binds root too).
 TEST(IniFile, FailedWriteKeepsTheOldFile) {
   vxtest::TempDir dir;
   WriteFile(dir.Path("a.ini"), "[a]\nk=1\n");
-  vxMappedINIFile ini(dir.Path("a.ini").c_str());
+  Ini ini(dir.Path("a.ini").c_str());
   ASSERT_EQ(0, ini.Open(1));
   ini.SetVal("a", "k", std::string(64 * 1024, 'x').c_str());
   struct rlimit old;
   ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &old));
-  struct rlimit small = old;
-  small.rlim_cur = 4096;
-  auto oldHandler = signal(SIGXFSZ, SIG_IGN);
+  struct rlimit small = {4096, old.rlim_max};
+  signal(SIGXFSZ, SIG_IGN);  // a write beyond the limit fails instead of killing the process
   ASSERT_EQ(0, setrlimit(RLIMIT_FSIZE, &small));
   int result = ini.Close(1);
   setrlimit(RLIMIT_FSIZE, &old);
-  signal(SIGXFSZ, oldHandler);
   EXPECT_EQ(1, result);
   EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("a.ini")));
-  EXPECT_EQ(std::vector<std::string>{"a.ini"}, Names(dir.path()));
-}
-
-TEST(IniFile, LongFileNamesCanBeSaved) {
-  vxtest::TempDir dir;
-  std::string path = dir.Path(std::string(250, 'n') + ".ini");
-  WriteFile(path, "[a]\nk=1\n");
-  vxMappedINIFile ini(path.c_str());
-  ASSERT_EQ(0, ini.Open(1));
-  ini.SetVal("a", "k", "2");
-  ASSERT_EQ(0, ini.Close(1));
-  EXPECT_EQ("[a]\nk=2\n", ReadFile(path));
-}
-
-TEST(IniFile, RebindingNeverReplacesAnotherExistingFile) {
-  vxtest::TempDir dir;
-  WriteFile(dir.Path("a.ini"), "[a]\nk=1\n");
-  WriteFile(dir.Path("b.ini"), "[b]\n");
-  vxMappedINIFile ini(dir.Path("a.ini").c_str());
-  ASSERT_EQ(0, ini.Open(1));
-  ini.SetFilename(dir.Path("b.ini").c_str());
-  EXPECT_EQ(1, ini.Close(1));
-  EXPECT_EQ("[b]\n", ReadFile(dir.Path("b.ini")));
-
-  ASSERT_EQ(0, ini.Open(1));  // b.ini, now loaded
-  ini.SetFilename(vxStringBase(dir.Path("c.ini").c_str()));
-  EXPECT_EQ(0, ini.Close(1));
-  EXPECT_EQ("[b]\n", ReadFile(dir.Path("c.ini")));
-}
-
-TEST(IniFile, MergeKeepsDestinationValuesAndAddsTheRestInSourceOrder) {
-  vxtest::TempDir dir;
-  WriteFile(dir.Path("dst.ini"), "[main]\nk=dest\n; end of main\n\n[dest]\nd=1\n");
-  WriteFile(dir.Path("src.ini"),
-            "[MAIN]\r\n; c\r\nK=src\r\nnew1 = a\r\nNEW1=dup\r\nnew2=b\r\n[other]\r\nx=1\r\n"
-            "[Main]\r\nhidden=1\r\n[third]\r\n");
-  vxMappedINIFile src(dir.Path("src.ini").c_str());
-  vxMappedINIFile dst(dir.Path("dst.ini").c_str());
-  ASSERT_EQ(0, src.Open(1));
-  ASSERT_EQ(0, dst.Open(1));
-  dst.MergeFrom(src);
-  EXPECT_EQ(0, src.Close(0));
-  ASSERT_EQ(0, dst.Close(1));
-  EXPECT_EQ("[main]\nk=dest\nnew1 = a\nnew2=b\n; end of main\n\n[dest]\nd=1\n[other]\nx=1\n[third]\n",
-            ReadFile(dir.Path("dst.ini")));
-}
-
-std::string ManyKeys(int count, int offset) {
-  std::string text = "[big]\n";
-  for (int i = 0; i < count; ++i) {
-    text += "Key" + std::to_string(i + offset) + "=" + std::to_string(i + offset) + "\n";
-  }
-  return text;
-}
-
-TEST(IniFile, HundredThousandKeySectionsAnswerAndMergeCorrectly) {
-  vxtest::TempDir dir;
-  WriteFile(dir.Path("a.ini"), ManyKeys(100000, 0));
-  WriteFile(dir.Path("b.ini"), ManyKeys(100000, 50000));
-  vxMappedINIFile a(dir.Path("a.ini").c_str());
-  vxMappedINIFile b(dir.Path("b.ini").c_str());
-  ASSERT_EQ(0, a.Open(1));
-  ASSERT_EQ(0, b.Open(1));
-  for (int i = 0; i < 100000; i += 7) {
-    ASSERT_EQ(std::to_string(i), a.GetVal("BIG", ("kEY" + std::to_string(i)).c_str()).str());
-  }
-  a.MergeFrom(b);
-  EXPECT_EQ(150000u, a.GetPropertyList("big")->size());
-  EXPECT_EQ("149999", a.GetVal("big", "key149999").str());
-  ASSERT_EQ(0, a.Close(1));
-  EXPECT_EQ(ManyKeys(150000, 0), ReadFile(dir.Path("a.ini")));
-}
-
-TEST(IniFile, LinesAddedThroughTheListAreFound) {
-  vxMappedINIFile ini;
-  ini.SetVal("s", "a", "1");
-  ini.GetPropertyList("s")->push_back(new INILine("b", "2"));
-  EXPECT_EQ("2", ini.GetVal("s", "B").str());
-  ini.SetVal("s", "b", "3");
-  EXPECT_EQ(2u, ini.GetPropertyList("s")->size());
-  EXPECT_EQ("3", ini.GetVal("s", "b").str());
+  EXPECT_EQ(Names{"a.ini"}, vxtest::ListTree(dir.path()));
 }
 
 }  // namespace
