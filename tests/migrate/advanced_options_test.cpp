@@ -23,14 +23,13 @@ const char kMigrated[] = "Advanced option file migrated: ";
 // "[Default]\ncontentgroupprofileCount=<count>\n" (when count is given), then one section per name
 // numbered from 0: "profilename=<name>" and "pattern=/<name>/*"; an empty name leaves a gap.
 std::string Entries(const char* count, const std::vector<std::string>& names) {
-  std::string text = count == nullptr ? "" : std::string("[Default]\ncontentgroupprofileCount=") +
-                                                 count + "\n";
+  std::string ini = count ? std::string("[Default]\ncontentgroupprofileCount=") + count + "\n" : "";
   for (size_t i = 0; i < names.size(); ++i) {
     if (names[i].empty()) continue;
-    text += "[contentgroupprofile" + std::to_string(i) + "]\nprofilename=" + names[i] +
+    ini += "[contentgroupprofile" + std::to_string(i) + "]\nprofilename=" + names[i] +
             "\npattern=/" + names[i] + "/*\n";
   }
-  return text;
+  return ini;
 }
 
 int Merge(SettingsRun& run, const char* source = kGroups, const char* destination = kGroups) {
@@ -88,17 +87,17 @@ TEST(AdvancedOptionsMerge, MissingFileOnEitherSideChangesNothing) {
 }
 
 TEST(AdvancedOptionsMerge, QualificationKeysFollowTheEntrysNewNumber) {
+  const char* const pav = "pavsuite";
   const char* const cases[][5] = {  // products, file name, key, key written
-      {"pavsuite", "pavsuite", kPagesBackslash, "Qualification4URL", "Qualification7URL"},
+      {pav, pav, kPagesBackslash, "Qualification4URL", "Qualification7URL"},
       {"halsuite", "obx", kPagesBackslash, "Qualification4URL", "Qualification0URL"},
       {"halsuite", "tqrs", kPagesBackslash, "Qualification4URL", "Qualification0URL"},
-      {"mirsuite", "pavsuite", kPagesBackslash, "Qualification12PageURLx", "Qualification7URLx"},
+      {"mirsuite", pav, kPagesBackslash, "Qualification12PageURLx", "Qualification7URLx"},
       // Without "URL" the whole old key follows the number.
-      {"pavsuite", "pavsuite", kPagesBackslash, "Qualification2Page",
-       "Qualification7Qualification2Page"},
-      {"pavsuite", "pavsuite", kPagesBackslash, "QualificationURL", "QualificationURL"},
+      {pav, pav, kPagesBackslash, "Qualification2Page", "Qualification7Qualification2Page"},
+      {pav, pav, kPagesBackslash, "QualificationURL", "QualificationURL"},
       {"obx", "obx", kPagesBackslash, "Qualification4URL", "Qualification4URL"},
-      {"pavsuite", "pavsuite", kPages, "Qualification4URL", "Qualification4URL"}};
+      {pav, pav, kPages, "Qualification4URL", "Qualification4URL"}};
   for (const auto& c : cases) {
     SettingsRun run(c[0], c[1], "5.0", "5.5");
     WriteFile(run.Src(kPages), std::string("[Default]\nqueryprofileCount=1\n[queryprofile0]\n") +

@@ -71,8 +71,7 @@ TEST(CookieConversion, GivesTheNumberedDefinitionInTheFilesOwnLineEnds) {
       WriteFile(run.Dst(kLogSettings), CookieFile(c[0], eol));
       EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
       EXPECT_EQ(CookieFile(c[1] ? c[1] : c[0], eol), ReadFile(run.Dst(kLogSettings)));
-      EXPECT_EQ(c[1] ? std::vector<std::string>{kConverted} : std::vector<std::string>{},
-                run.Logged());
+      EXPECT_EQ(std::vector<std::string>(c[1] ? 1 : 0, kConverted), run.Logged());
     }
   }
 }
@@ -90,19 +89,19 @@ TEST(CookieConversion, OnlyFromBeforeToAfterTheMiddleOfALine) {
     SettingsRun run(c[0], c[1], c[2], c[3]);
     WriteFile(run.Dst(kLogSettings), old);
     EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-    EXPECT_EQ(c[4] ? std::vector<std::string>{kConverted} : std::vector<std::string>{},
-              run.Logged());
+    EXPECT_EQ(std::vector<std::string>(c[4] ? 1 : 0, kConverted), run.Logged());
     // Saved without change, the file stays byte for byte as it was.
     EXPECT_EQ(c[4] != nullptr, old != ReadFile(run.Dst(kLogSettings)));
   }
 }
 
 TEST(TableLimit, IsTheNextThousandAboveTheTopCountUnlessAlreadySet) {
-  const char* const cases[][2] = {  // the [Defaults] section's lines, the limit added (null: none)
+  // The [Defaults] section's lines, and the limit added (null: none). An exact thousand moves a
+  // step up.
+  const char* const cases[][2] = {
       {"Other=5", "1000"}, {"MaxTopCount=250", "1000"}, {"MaxTopCount=2500", "3000"},
-      {"MaxTopCount=3000", "4000"},  // an exact thousand moves up
-      {"MaxTopCount=99000", "99000"}, {"MaxTopCount=150000", "150000"},
-      {"MaxTopCount=-2500", "1000"}, {"MaxTopCount=lots", "1000"},
+      {"MaxTopCount=3000", "4000"}, {"MaxTopCount=99000", "99000"}, {"MaxTopCount=-2500", "1000"},
+      {"MaxTopCount=150000", "150000"}, {"MaxTopCount=lots", "1000"},
       {"MaxTopCount=99999999999999999999", "1000000"},
       {"MaxTopCount=5000\r\n[MaxTableSizes]\r\nTopCompanies=200", nullptr},
   };
