@@ -20,6 +20,7 @@ TEST(DataFileMerge, GivesTheExpectedText) {
       {"a\n", "x\n\ny\n", "a\nx"},                 // the first empty line ends the merge
       {"a\n", "x\nx,1\nx\n", "a\nx\nx,1"},         // a repeated record is added once
       {"a", "b", "a\nb"},                          // a line feed before the first added line
+      // An empty destination gains a line feed; CRLF lines stay, added lines end in a line feed.
       {"", "a\n", "\na"}, {"a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
       {std::string("a\0b\n", 4), "a\n", std::string("a\0b\na", 5)}};
   for (const auto& c : cases) {
