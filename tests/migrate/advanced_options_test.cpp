@@ -27,7 +27,7 @@ std::string Entries(const char* count, const std::vector<std::string>& names) {
   for (size_t i = 0; i < names.size(); ++i) {
     if (names[i].empty()) continue;
     ini += "[contentgroupprofile" + std::to_string(i) + "]\nprofilename=" + names[i] +
-            "\npattern=/" + names[i] + "/*\n";
+           "\npattern=/" + names[i] + "/*\n";
   }
   return ini;
 }
