@@ -3,168 +3,116 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <string>
 #include <vector>
 
-#include "foundation/string/string_base.h"
-#include "foundation/string/tokenizer.h"
 #include "migrate/settings_fixture.h"
 
 namespace vxtest {
 namespace {
 
-struct MergeCase {
-  const char* name;
-  std::string destination;
-  std::string source;
-  std::string merged;
-};
-
-class DataFileMerge : public ::testing::TestWithParam<MergeCase> {};
-
-TEST_P(DataFileMerge, GivesTheExpectedText) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Src("datfiles/spiders.txt"), GetParam().source);
-  WriteFile(run.Dst("datfiles/spiders.txt"), GetParam().destination);
-  EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\datfiles\\spiders.txt", "\\datfiles\\spiders.txt"));
-  EXPECT_EQ(GetParam().merged, ReadFile(run.Dst("datfiles/spiders.txt")));
-  EXPECT_EQ(std::vector<std::string>{"Data File Merged: \\datfiles\\spiders.txt"}, run.Logged());
+TEST(DataFileMerge, GivesTheExpectedText) {
+  const std::string cases[][3] = {  // destination, source, merged
+      {"x\na,b,c\n", "a,b\n", "x\na,b,c\n"},       // the record's fields begin a line
+      {"a,b\n", "a,b,c\n", "a,b\na,b,c"},          // the line's fields begin the record
+      {"a\n", "x\n\ny\n", "a\nx"},                 // the first empty line ends the merge
+      {"a\n", "x\nx,1\nx\n", "a\nx\nx,1"},         // a repeated record is added once
+      {"a", "b", "a\nb"},                          // a line feed before the first added line
+      // An empty destination gains a line feed; CRLF lines stay, added lines end in a line feed.
+      {"", "a\n", "\na"}, {"a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
+      {std::string("a\0b\n", 4), "a\n", std::string("a\0b\na", 5)}};
+  for (const auto& c : cases) {
+    SettingsRun run;
+    WriteFile(run.Src("dat/spiders.txt"), c[1]);
+    WriteFile(run.Dst("dat/spiders.txt"), c[0]);
+    EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\dat\\spiders.txt", "\\dat\\spiders.txt"));
+    EXPECT_EQ(c[2], ReadFile(run.Dst("dat/spiders.txt"))) << c[0] << "|" << c[1];
+    EXPECT_EQ(std::vector<std::string>{"Data File Merged: \\dat\\spiders.txt"}, run.Logged());
+  }
 }
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, DataFileMerge,
-    ::testing::Values(
-        MergeCase{"FieldsAPrefixOfALine", "x\na,b,c\n", "a,b\n", "x\na,b,c\n"},
-        MergeCase{"MoreFieldsThanTheLine", "a,b\n", "a,b,c\n", "a,b\na,b,c"},
-        MergeCase{"EmptyFieldsKeepTheirPlace", "a\n", "a,\n", "a\na,"},
-        MergeCase{"FirstEmptyLineEndsTheMerge", "a\n", "x\n\ny\n", "a\nx"},
-        MergeCase{"RepeatedRecordAddedOnce", "a\n", "x\nx,1\nx\n", "a\nx\nx,1"},
-        MergeCase{"LineFeedBeforeFirstAddedLine", "a", "b", "a\nb"},
-        // The stripped line is what later records compare with.
-        MergeCase{"StrippedLineMatchesLaterRecords", "a,b  \n", "c\na,b\n", "a,b\nc"},
-        MergeCase{"EmptyDestinationGainsALineFeed", "", "a\n", "\na"},
-        MergeCase{"CrlfLinesKept", "a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
-        MergeCase{"CrlfEmptyLineEndsTheMerge", "a\r\n", "x\r\n\r\ny\r\n", "a\nx"},
-        MergeCase{"BinaryBytesCompared", std::string("a\0b\n", 4), "a\n",
-                  std::string("a\0b\na", 5)}),
-    [](const ::testing::TestParamInfo<MergeCase>& info) { return info.param.name; });
 
 // The literal reading of the merge: every record compared with every line of the text as it
 // stands, the whole text stripped before each append. The indexed merge must agree with it.
-std::vector<std::string> Fields(const std::string& line) {
-  std::vector<std::string> fields;
-  vxBStringTokenizer tokens(vxStringBase(line), vxBStringTokenizer::m_csvToken, true);
-  vxStringBase field;
-  while (tokens.GetNext(field)) fields.push_back(field.str());
-  return fields;
-}
-
-std::vector<std::string> Lines(const std::string& text) {
-  std::vector<std::string> lines;
+std::vector<std::string> Split(const std::string& text, char separator) {
+  std::vector<std::string> parts;
   size_t start = 0;
-  while (start < text.size()) {
-    size_t end = text.find('\n', start);
-    if (end == std::string::npos) end = text.size();
-    std::string line = text.substr(start, end - start);
-    if (!line.empty() && line.back() == '\r') line.pop_back();
-    lines.push_back(line);
-    start = end + 1;
+  for (size_t end; (end = text.find(separator, start)) != std::string::npos; start = end + 1) {
+    parts.push_back(text.substr(start, end - start));
   }
-  return lines;
+  parts.push_back(text.substr(start));
+  for (std::string& part : parts) {  // a line of a CRLF text ends without its carriage return
+    if (separator == '\n' && !part.empty() && part.back() == '\r') part.pop_back();
+  }
+  return parts;
 }
 
 std::string ScanningMerge(std::string destination, const std::string& source) {
-  for (const std::string& record : Lines(source)) {
+  for (const std::string& record : Split(source, '\n')) {
     if (record.empty()) break;
-    std::vector<std::string> wanted = Fields(record);
+    const std::vector<std::string> wanted = Split(record, ',');
     bool found = false;
-    for (const std::string& line : Lines(destination)) {
-      std::vector<std::string> have = Fields(line);
-      if (!line.empty() && wanted.size() <= have.size() &&
-          std::equal(wanted.begin(), wanted.end(), have.begin())) {
-        found = true;
-        break;
-      }
+    for (const std::string& line : Split(destination, '\n')) {
+      const std::vector<std::string> have = Split(line, ',');
+      found = found || (!line.empty() && wanted.size() <= have.size() &&
+                        std::equal(wanted.begin(), wanted.end(), have.begin()));
     }
     if (found) continue;
+    // Stripped, the text no longer ends with a line feed: one goes before the record.
     vxStringBase text(destination);
     text.stripWhite(vxStringBase::kBoth);
-    destination = text.str();
-    if (destination.empty() || destination.back() != '\n') destination += '\n';
-    destination += record;
+    destination = text.str() + "\n" + record;
   }
   return destination;
 }
 
-std::string RandomText(std::mt19937& random) {
-  static const char kAlphabet[] = "ab,,,\n\n\n \r\t";
-  std::uniform_int_distribution<int> length(0, 24);
-  std::uniform_int_distribution<int> pick(0, sizeof(kAlphabet) - 2);
-  std::string text;
-  for (int n = length(random); n > 0; --n) text.push_back(kAlphabet[pick(random)]);
-  return text;
-}
-
 TEST(DataFileMerge, AgreesWithComparingEveryLine) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
+  SettingsRun run;
   std::mt19937 random(20240611);
+  const std::string alphabet = "ab,,,\n\n\n \r\t";
   for (int round = 0; round < 800; ++round) {
-    const std::string destination = RandomText(random);
-    const std::string source = RandomText(random);
-    WriteFile(run.Src("list.txt"), source);
-    WriteFile(run.Dst("list.txt"), destination);
-    const int result = run.manager().DoMergeCSVFile("list.txt", "list.txt");
-    const std::string expected = source.empty() ? destination : ScanningMerge(destination, source);
-    ASSERT_EQ(source.empty() ? 1 : 0, result);
-    ASSERT_EQ(expected, ReadFile(run.Dst("list.txt")))
-        << "destination [" << destination << "] source [" << source << "]";
+    std::string texts[2];  // destination, source: up to 24 characters each
+    for (std::string& text : texts) {
+      for (size_t n = random() % 25; n > 0; --n) text += alphabet[random() % alphabet.size()];
+    }
+    WriteFile(run.Dst("list.txt"), texts[0]);
+    WriteFile(run.Src("list.txt"), texts[1]);
+    ASSERT_EQ(texts[1].empty() ? 1 : 0, run.manager().DoMergeCSVFile("list.txt", "list.txt"));
+    ASSERT_EQ(ScanningMerge(texts[0], texts[1]), ReadFile(run.Dst("list.txt")))
+        << "destination [" << texts[0] << "] source [" << texts[1] << "]";
   }
 }
 
-TEST(DataFileMerge, MissingDestinationIsACopyOfTheSource) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Src("dat/refs.txt"), "a,b\r\n\r\nc\r\n");
-  EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\dat\\refs.txt", "\\dat\\refs.txt"));
-  EXPECT_EQ("a,b\r\n\r\nc\r\n", ReadFile(run.Dst("dat/refs.txt")));
-  EXPECT_EQ(std::vector<std::string>{"TXT file doesn't exist - file being copied: " +
-                                     run.Src("dat/refs.txt")},
+TEST(DataFileMerge, MissingOrUnwritableFiles) {
+  SettingsRun run;
+  // Neither file: the copy fails.
+  EXPECT_EQ(1, run.manager().DoMergeCSVFile("a.txt", "a.txt"));
+  // No destination: the source is copied byte for byte.
+  WriteFile(run.Src("dat/b.txt"), "a,b\r\n\r\nc\r\n");
+  EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\dat\\b.txt", "\\dat\\b.txt"));
+  EXPECT_EQ("a,b\r\n\r\nc\r\n", ReadFile(run.Dst("dat/b.txt")));
+  // No source: the destination stays.
+  WriteFile(run.Dst("c.txt"), "a\n");
+  EXPECT_EQ(1, run.manager().DoMergeCSVFile("c.txt", "c.txt"));
+  EXPECT_EQ("a\n", ReadFile(run.Dst("c.txt")));
+  // A folder where the destination should be is left alone.
+  WriteFile(run.Src("d.txt"), "a\n");
+  MakeDirs(run.Dst("d.txt"));
+  EXPECT_EQ(1, run.manager().DoMergeCSVFile("d.txt", "d.txt"));
+  EXPECT_EQ((std::vector<std::string>{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}),
+            ListTree(run.Dst("")));
+  const std::string copying = "TXT file doesn't exist - file being copied: ";
+  EXPECT_EQ((std::vector<std::string>{copying + run.Src("a.txt"), copying + run.Src("dat/b.txt")}),
             run.Logged());
-}
-
-TEST(DataFileMerge, BothFilesMissingIsAFailedCopy) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  EXPECT_EQ(1, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_FALSE(FileExists(run.Dst("refs.txt")));
-  EXPECT_EQ(std::vector<std::string>{"TXT file doesn't exist - file being copied: " +
-                                     run.Src("refs.txt")},
-            run.Logged());
-}
-
-TEST(DataFileMerge, EmptyOrMissingSourceLeavesTheDestination) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Dst("refs.txt"), "a\n");
-  EXPECT_EQ(1, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  WriteFile(run.Src("refs.txt"), "");
-  EXPECT_EQ(1, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_EQ("a\n", ReadFile(run.Dst("refs.txt")));
-  EXPECT_TRUE(run.Logged().empty());
-}
-
-TEST(DataFileMerge, DestinationThatIsAFolderIsNotTouched) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Src("refs.txt"), "a\n");
-  MakeDirs(run.Dst("refs.txt"));
-  EXPECT_EQ(1, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_EQ(std::vector<std::string>{}, ListTree(run.Dst("refs.txt")));
 }
 
 TEST(DataFileMerge, InPlaceRunReadsAndWritesNothing) {
-  auto run = SettingsRun::InPlace("pavsuite", "pavsuite", "5.5", "5.5");
-  WriteFile(run->Dst("refs.txt"), "a");
-  EXPECT_EQ(0, run->manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_EQ("a", ReadFile(run->Dst("refs.txt")));
-  EXPECT_TRUE(run->Logged().empty());
+  SettingsRun run("pavsuite", "pavsuite", "5.5", "5.5", true);
+  WriteFile(run.Dst("refs.txt"), "a");
+  EXPECT_EQ(0, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
+  EXPECT_EQ("a", ReadFile(run.Dst("refs.txt")));
+  EXPECT_TRUE(run.Logged().empty());
 }
 
 }  // namespace

@@ -1,5 +1,8 @@
-// The log-analysis settings rewrites: the old single cookie definition becomes the numbered form
-// between the right versions only, and the company table limit follows the old top-list length.
+// The main settings merge and the log-analysis settings rewrites that follow it (the old single
+// cookie definition becomes the numbered form between the right versions only, and the company
+// table limit follows the old top-list length), and the search-engine merge: the new
+// installation's engines keep their numbers and gain the old settings, engines only the old
+// installation has are appended under fresh numbers.
 
 #include <gtest/gtest.h>
 
@@ -14,152 +17,137 @@ namespace {
 const char kLogSettings[] = "vxm_log/vxm_log.ini";
 const char kConverted[] = "New-style cookie created in vxm_log.ini";
 
-std::string OldCookie(const std::string& validate, const std::string& plugin, const char* eol) {
-  std::string text = std::string("[Defaults]") + eol + "MaxTopCount=100" + eol + "[Cookie]" + eol +
-                     "Enable=1" + eol;
-  if (!validate.empty()) text += "Validate=" + validate + eol;
-  if (!plugin.empty()) text += "VantixPlugin=" + plugin + eol;
-  return text + "CookieText=Session id" + eol + "CookieString=SID" + eol;
+TEST(MainSettingsMerge, MergesTheOldFileOrItsInPlaceBackupThenConvertsCookies) {
+  for (bool inPlace : {false, true}) {
+    SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5", inPlace);
+    const std::string old = inPlace ? run.Dst("vantix.vxinibak") : run.Src("vantix.ini");
+    WriteFile(old, "[Main]\r\nLanguage=German\r\nPort=81\r\n[Old]\r\nA=1\r\n");
+    WriteFile(run.Dst("vantix.ini"), "; new\r\n[Main]\r\nPort=8080\r\n");
+    WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
+    EXPECT_EQ(0, run.manager().DoVantixINIMerge());
+    // The new value wins; the old file's other settings are added.
+    EXPECT_EQ("; new\r\n[Main]\r\nPort=8080\r\nLanguage=German\r\n[Old]\r\nA=1\r\n",
+              ReadFile(run.Dst("vantix.ini")));
+    EXPECT_EQ((std::vector<std::string>{"INI file merged: " + old, kConverted}), run.Logged());
+  }
 }
 
-struct CookieCase {
-  const char* name;
-  std::string validate;
-  std::string plugin;
-  std::vector<std::string> cookie0;
-};
+TEST(MainSettingsMerge, MissingFilesAreNotCreatedAndMissingDestinationTakesACopy) {
+  SettingsRun run;
+  EXPECT_EQ(0, run.manager().DoVantixINIMerge());
+  EXPECT_EQ(1, run.manager().DoVXMLogINIChange());
+  EXPECT_EQ(1, run.manager().DoTableLimitINIChange());
+  EXPECT_EQ(std::vector<std::string>{"vxmigrate.log"}, ListTree(run.Dst("")));
+  WriteFile(run.Src("vantix.ini"), "[Main]\nPort=81\n");
+  WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
+  EXPECT_EQ(0, run.manager().DoVantixINIMerge());
+  EXPECT_EQ("[Main]\nPort=81\n", ReadFile(run.Dst("vantix.ini")));
+  const std::string copied = "INI file doesn't exist - file being copied: " + run.Src("vantix.ini");
+  EXPECT_EQ((std::vector<std::string>{copied, kConverted}), run.Logged());
+}
 
-class CookieConversion : public ::testing::TestWithParam<CookieCase> {};
+// "[Cookie]" and the given lines, each "|" standing for the line end under test.
+std::string CookieFile(const char* lines, const std::string& eol) {
+  std::string text = std::string("[Cookie]|") + lines;
+  for (size_t at; (at = text.find('|')) != std::string::npos;) text.replace(at, 1, eol);
+  return text;
+}
 
-TEST_P(CookieConversion, GivesTheNumberedDefinition) {
-  for (const char* eol : {"\n", "\r\n"}) {
-    SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-    WriteFile(run.Dst(kLogSettings), OldCookie(GetParam().validate, GetParam().plugin, eol));
-    EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-    EXPECT_EQ((std::vector<std::string>{"NumCookies=1", "Global=1"}),
-              SectionLines(run.Dst(kLogSettings), "Cookie"));
-    EXPECT_EQ(GetParam().cookie0, SectionLines(run.Dst(kLogSettings), "Cookie0"));
-    EXPECT_EQ(std::vector<std::string>{kConverted}, run.Logged());
-    if (std::string(eol) == "\r\n") {
-      // A CRLF file stays one: new lines take the file's own line end.
-      std::string text = ReadFile(run.Dst(kLogSettings));
-      for (size_t at = text.find('\n'); at != std::string::npos; at = text.find('\n', at + 1)) {
-        ASSERT_TRUE(at > 0 && text[at - 1] == '\r') << text;
-      }
+TEST(CookieConversion, GivesTheNumberedDefinitionInTheFilesOwnLineEnds) {
+  // The [Cookie] section's lines, and the file after the conversion (null: saved unchanged).
+  const char* const cases[][2] = {
+      {"Enable=1|Validate=1|VantixPlugin=0|CookieText=Session id|CookieString=SID|",
+       "NumCookies=1|Global=1|[Cookie0]|Name=Default Cookie|Enabled=1|Type=2|Key=SID|"},
+      {"Enable=1|Validate=0|VantixPlugin=1|CookieString=SID|",
+       "NumCookies=1|Global=1|[Cookie0]|Name=Default Cookie|Enabled=1|Type=0|"},
+      // The new installation's count is kept.
+      {"NumCookies=3|Enable=0|VantixPlugin=1|[Cookie0]|Name=Mine|",
+       "NumCookies=3|[Cookie0]|Name=Default Cookie|Enabled=0|Type=1|"},
+      {"NumCookies = 2||[Cookie0]|Name=A ; x|", nullptr},
+  };
+  for (const auto& c : cases) {
+    for (const char* eol : {"\n", "\r\n"}) {
+      SettingsRun run;
+      WriteFile(run.Dst(kLogSettings), CookieFile(c[0], eol));
+      EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
+      EXPECT_EQ(CookieFile(c[1] ? c[1] : c[0], eol), ReadFile(run.Dst(kLogSettings)));
+      EXPECT_EQ(std::vector<std::string>(c[1] ? 1 : 0, kConverted), run.Logged());
     }
   }
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Cases, CookieConversion,
-    ::testing::Values(
-        CookieCase{"NamedCookie", "1", "0",
-                   {"Name=Default Cookie", "Enabled=1", "Type=2", "Key=SID"}},
-        CookieCase{"NotValidated", "0", "1", {"Name=Default Cookie", "Enabled=1", "Type=0"}},
-        CookieCase{"ProductPlugin", "1", "1", {"Name=Default Cookie", "Enabled=1", "Type=1"}}),
-    [](const ::testing::TestParamInfo<CookieCase>& info) { return info.param.name; });
-
-TEST(CookieConversion, KeepsTheNewInstallationsCountAndEnableValue) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Dst(kLogSettings),
-            "[Cookie]\nNumCookies=3\nEnable=0\nVantixPlugin=1\n[Cookie0]\nName=Mine\n");
-  EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-  EXPECT_EQ(std::vector<std::string>{"NumCookies=3"}, SectionLines(run.Dst(kLogSettings), "Cookie"));
-  EXPECT_EQ((std::vector<std::string>{"Name=Default Cookie", "Enabled=0", "Type=1"}),
-            SectionLines(run.Dst(kLogSettings), "Cookie0"));
-}
-
-struct GateCase {
-  const char* name;
-  const char* sourceProduct;
-  const char* destinationProduct;
-  const char* sourceVersion;
-  const char* destinationVersion;
-  bool converts;
-};
-
-class CookieVersionGate : public ::testing::TestWithParam<GateCase> {};
-
-TEST_P(CookieVersionGate, ConvertsOnlyFromBeforeToAfterTheMiddleOfALine) {
-  const GateCase& c = GetParam();
-  SettingsRun run(c.sourceProduct, c.destinationProduct, c.sourceVersion, c.destinationVersion);
+TEST(CookieConversion, OnlyFromBeforeToAfterTheMiddleOfALine) {
+  const char* const pav = "pavsuite";
+  const char* const cases[][5] = {  // products, versions, and whether the cookie is converted
+      {pav, pav, "5.0", "5.5", "yes"},     {pav, pav, "5.5", "6.0", nullptr},
+      {pav, pav, "4.7", "5.5", nullptr},   {pav, pav, "5.0", "6.0", nullptr},
+      {"log", "log", "6.0", "6.5", "yes"}, {pav, "log", "5.0", "5.5", nullptr},
+      {"log", pav, "6.0", "5.5", "yes"}};
   const std::string old = "; cookie settings\r\n[Cookie]\r\nEnable = 1\r\nCookieString=SID\r\n";
-  WriteFile(run.Dst(kLogSettings), old);
-  EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-  if (c.converts) {
-    EXPECT_EQ(std::vector<std::string>{kConverted}, run.Logged());
-    EXPECT_NE(old, ReadFile(run.Dst(kLogSettings)));
-  } else {
-    EXPECT_TRUE(run.Logged().empty());
-    EXPECT_EQ(old, ReadFile(run.Dst(kLogSettings)));  // saved, and byte for byte as it was
+  for (const auto& c : cases) {
+    SCOPED_TRACE(std::string(c[0]) + " " + c[2] + " -> " + c[1] + " " + c[3]);
+    SettingsRun run(c[0], c[1], c[2], c[3]);
+    WriteFile(run.Dst(kLogSettings), old);
+    EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
+    EXPECT_EQ(std::vector<std::string>(c[4] ? 1 : 0, kConverted), run.Logged());
+    // Saved without change, the file stays byte for byte as it was.
+    EXPECT_EQ(c[4] != nullptr, old != ReadFile(run.Dst(kLogSettings)));
   }
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Cases, CookieVersionGate,
-    ::testing::Values(GateCase{"From50To55", "pavsuite", "pavsuite", "5.0", "5.5", true},
-                      GateCase{"From55To60", "pavsuite", "pavsuite", "5.5", "6.0", false},
-                      GateCase{"From45To55", "pavsuite", "pavsuite", "4.5", "5.5", false},
-                      GateCase{"From47To55", "pavsuite", "pavsuite", "4.7", "5.5", false},
-                      GateCase{"From50To60", "pavsuite", "pavsuite", "5.0", "6.0", false},
-                      GateCase{"LogFrom60To65", "log", "log", "6.0", "6.5", true},
-                      GateCase{"IntoLog55", "pavsuite", "log", "5.0", "5.5", false},
-                      GateCase{"FromLog60IntoPav55", "log", "pavsuite", "6.0", "5.5", true}),
-    [](const ::testing::TestParamInfo<GateCase>& info) { return info.param.name; });
-
-TEST(CookieConversion, FileWithoutOldCookieIsSavedUnchanged) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  const std::string text = "# comment\n[Cookie]\nNumCookies = 2\n\n[Cookie0]\nName=A ; x\n";
-  WriteFile(run.Dst(kLogSettings), text);
-  EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-  EXPECT_EQ(text, ReadFile(run.Dst(kLogSettings)));
-  EXPECT_TRUE(run.Logged().empty());
+TEST(TableLimit, IsTheNextThousandAboveTheTopCountUnlessAlreadySet) {
+  // The [Defaults] section's lines, and the limit added (null: none). An exact thousand moves a
+  // step up.
+  const char* const cases[][2] = {
+      {"Other=5", "1000"}, {"MaxTopCount=250", "1000"}, {"MaxTopCount=2500", "3000"},
+      {"MaxTopCount=3000", "4000"}, {"MaxTopCount=99000", "99000"}, {"MaxTopCount=-2500", "1000"},
+      {"MaxTopCount=150000", "150000"}, {"MaxTopCount=lots", "1000"},
+      {"MaxTopCount=99999999999999999999", "1000000"},
+      {"MaxTopCount=5000\r\n[MaxTableSizes]\r\nTopCompanies=200", nullptr},
+  };
+  for (const auto& c : cases) {
+    SettingsRun run;
+    const std::string text = std::string("[Defaults]\r\n") + c[0] + "\r\n";
+    WriteFile(run.Dst(kLogSettings), text);
+    EXPECT_EQ(0, run.manager().DoTableLimitINIChange());
+    EXPECT_EQ(c[1] ? text + "[MaxTableSizes]\r\nTopCompanies=" + c[1] + "\r\n" : text,
+              ReadFile(run.Dst(kLogSettings)));
+  }
 }
 
-TEST(LogSettings, MissingFileIsNotCreated) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  EXPECT_EQ(1, run.manager().DoVXMLogINIChange());
-  EXPECT_EQ(1, run.manager().DoTableLimitINIChange());
-  EXPECT_FALSE(FileExists(run.Dst(kLogSettings)));
-  EXPECT_TRUE(run.Logged().empty());
+TEST(KeywordMerge, KeepsNumbersUpdatesKnownEnginesAndAppendsNewOnes) {
+  SettingsRun run;
+  WriteFile(run.Src("keywords.ini"),
+            "[SearchEngines]\r\nEngine1=AltaVista\r\nEngine2=Google\r\nEngine3=\r\n"
+            "[AltaVista]\r\nDomain=altavista.com\r\nQuery=q\r\n"
+            "[Google]\r\nQuery=search\r\nLegacy=1\r\n");
+  WriteFile(run.Dst("keywords.ini"),
+            "; search engines of this installation\n[SearchEngines]\nEngine1=Google\n"
+            "Engine3=Bing\n\n[Google]\nDomain=google.\nQuery=q\nCharset=utf-8\n\n"
+            "[Bing]\nDomain=bing.com\nQuery=q\n");
+  EXPECT_EQ(0, run.manager().DoKeywordINIMerge());
+  // The old settings win for the keys the old file holds; the new file's other keys and its
+  // comment and layout stay. The added engine's number is the next free one: Engine3 is taken.
+  EXPECT_EQ("; search engines of this installation\n[SearchEngines]\nEngine1=Google\n"
+            "Engine3=Bing\nEngine4=AltaVista\n\n[Google]\nDomain=google.\nQuery=search\n"
+            "Charset=utf-8\nLegacy=1\n\n[Bing]\nDomain=bing.com\nQuery=q\n"
+            "[AltaVista]\nDomain=altavista.com\nQuery=q\n",
+            ReadFile(run.Dst("keywords.ini")));
+  EXPECT_EQ(std::vector<std::string>{"keywords.ini merged"}, run.Logged());
 }
 
-struct LimitCase {
-  const char* name;
-  const char* defaults;  // the "[Defaults]" section's lines
-  const char* limit;
-};
-
-class TableLimit : public ::testing::TestWithParam<LimitCase> {};
-
-TEST_P(TableLimit, IsTheNextThousandAboveTheTopCount) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  WriteFile(run.Dst(kLogSettings), std::string("[Defaults]\n") + GetParam().defaults);
-  EXPECT_EQ(0, run.manager().DoTableLimitINIChange());
-  EXPECT_EQ(std::vector<std::string>{std::string("TopCompanies=") + GetParam().limit},
-            SectionLines(run.Dst(kLogSettings), "MaxTableSizes"));
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, TableLimit,
-    ::testing::Values(LimitCase{"Missing", "Other=5\n", "1000"},
-                      LimitCase{"Empty", "MaxTopCount=\n", "1000"},
-                      LimitCase{"Small", "MaxTopCount=250\n", "1000"},
-                      LimitCase{"BetweenThousands", "MaxTopCount=2500\n", "3000"},
-                      LimitCase{"ExactThousandMovesUp", "MaxTopCount=3000\n", "4000"},
-                      LimitCase{"TopItself", "MaxTopCount=99000\n", "99000"},
-                      LimitCase{"Large", "MaxTopCount=150000\n", "150000"},
-                      LimitCase{"Negative", "MaxTopCount=-2500\n", "1000"},
-                      LimitCase{"Garbage", "MaxTopCount=lots\n", "1000"},
-                      LimitCase{"HugeIsHeld", "MaxTopCount=99999999999999999999\n", "1000000"}),
-    [](const ::testing::TestParamInfo<LimitCase>& info) { return info.param.name; });
-
-TEST(TableLimit, ExistingLimitIsKept) {
-  SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5");
-  const std::string text = "[Defaults]\r\nMaxTopCount=5000\r\n[MaxTableSizes]\r\nTopCompanies=200\r\n";
-  WriteFile(run.Dst(kLogSettings), text);
-  EXPECT_EQ(0, run.manager().DoTableLimitINIChange());
-  EXPECT_EQ(text, ReadFile(run.Dst(kLogSettings)));
+TEST(KeywordMerge, RefusesWithoutEnginesOnEitherSide) {
+  const char* const engines = "[SearchEngines]\nEngine1=A\n";
+  const char* const cases[][2] = {  // source, destination; null: no file
+      {nullptr, engines}, {engines, nullptr}, {"[A]\nx=1\n", engines}, {engines, "[B]\nx=1\n"}};
+  for (const auto& c : cases) {
+    SettingsRun run;
+    if (c[0] != nullptr) WriteFile(run.Src("keywords.ini"), c[0]);
+    if (c[1] != nullptr) WriteFile(run.Dst("keywords.ini"), c[1]);
+    EXPECT_EQ(1, run.manager().DoKeywordINIMerge());
+    EXPECT_EQ(c[1] != nullptr ? c[1] : "<missing>", ReadFile(run.Dst("keywords.ini")));
+    EXPECT_TRUE(run.Logged().empty());
+  }
 }
 
 }  // namespace
