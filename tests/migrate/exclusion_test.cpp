@@ -4,130 +4,108 @@
 #include <algorithm>
 #include <regex>
 #include <string>
-#include <vector>
 
+#include "migrate/installations_fixture.h"
 #include "migrate/sample_lists.h"
-#include "migrate/toolkit_fixture.h"
 
 namespace vxtest {
 namespace {
 
-std::string Replace(std::string text, const std::string& from, const std::string& to) {
-  for (size_t at = text.find(from); at != std::string::npos; at = text.find(from, at + to.size())) {
-    text.replace(at, from.size(), to);
+TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
+  struct Case {
+    const char* list;
+    const char* file;  // "$" stands for the source folder
+    bool inPlace;
+    const char* inPlaceExtension;
+    int fromInstallation;
+    int excluded;
+  };
+  const Case cases[] = {
+      {"", "a.wlp", false, "", 0, 0},
+      {"a.wlp, b.wlp", "b.wlp", false, "", 0, 1},
+      {" \ta.wlp\t ,  b.wlp  ", "a.wlp", false, "", 0, 1},
+      {"x.wlp, my site.wlp", "my site.wlp", false, "", 0, 1},
+      {"A.WLP", "a.wlp", false, "", 0, 1},
+      {"*.wlp", "a.wlp", false, "", 0, 0},       // no wildcards
+      {"a.wlp,", "", false, "", 0, 0},           // a trailing comma names nothing more
+      {"a.wlp,,b.wlp", "b.wlp", false, "", 0, 1},  // an empty name does not end the list
+      {"a.wlp", "$/a.wlp", false, "", 1, 1},
+      {"a.wlp", "$/sub/a.wlp", false, "", 1, 0},
+      {"x.wlp, sub/a.wlp", "$/sub/a.wlp", false, "", 1, 1},
+      {"sub\\a.wlp", "$/sub/a.wlp", false, "", 1, 1},
+      {"a.wlp", "$/a.wlp", false, "", 0, 0},
+      {"x.ini", "x.ini", false, "bak", 0, 1},
+      {"x.ini", "x.bak", true, "bak", 0, 1},  // in place, "x.ini" stands for the old file
+      {"x.ini", "x.ini", true, "bak", 0, 0},
+      {"sub/x.ini", "$/sub/x.vxinibak", true, "vxinibak", 1, 1},
+      {"x.ini", "x.", true, "", 0, 1}};
+  Installations sideBySide;
+  Installations inPlace(RunOptions{{}, true});
+  for (const Case& c : cases) {
+    Installations& run = c.inPlace ? inPlace : sideBySide;
+    std::string file = c.file;
+    if (file[0] == '$') file.replace(0, 1, run.Src());
+    EXPECT_EQ(c.excluded, run.manager().IsExcludeFile(file.c_str(), c.list, c.inPlaceExtension,
+                                                       c.fromInstallation))
+        << "\"" << c.list << "\" " << c.file << (c.inPlace ? " in place" : "");
   }
-  return text;
+  EXPECT_EQ(Entries{}, sideBySide.RunLog());
+  EXPECT_EQ(Entries{}, inPlace.RunLog());
 }
-
-struct ExcludeCase {
-  const char* name;
-  const char* list;
-  const char* file;  // "$SRC" stands for the source folder
-  bool inPlace;
-  const char* inPlaceExtension;
-  int fromInstallation;
-  int excluded;
-};
-
-class IsExcludeFile : public ToolkitTest, public ::testing::WithParamInterface<ExcludeCase> {};
-
-TEST_P(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
-  const ExcludeCase& c = GetParam();
-  StartRun(c.inPlace);
-  const vxStringBase file(Replace(c.file, "$SRC", src_).c_str());
-  EXPECT_EQ(c.excluded, manager_->IsExcludeFile(file, c.list, c.inPlaceExtension, c.fromInstallation));
-  EXPECT_TRUE(NewLogEntries().empty());
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, IsExcludeFile,
-    ::testing::Values(
-        ExcludeCase{"EmptyListExcludesNothing", "", "a.wlp", false, "", 0, 0},
-        ExcludeCase{"LastName", "a.wlp,b.wlp", "b.wlp", false, "", 0, 1},
-        ExcludeCase{"BlankAfterComma", "a.wlp, b.wlp", "b.wlp", false, "", 0, 1},
-        ExcludeCase{"BlanksAndTabsAround", " \ta.wlp\t ,  b.wlp  ", "a.wlp", false, "", 0, 1},
-        ExcludeCase{"NameWithBlanks", "x.wlp, my site.wlp", "my site.wlp", false, "", 0, 1},
-        ExcludeCase{"CaseIgnored", "A.WLP", "a.wlp", false, "", 0, 1},
-        ExcludeCase{"NoWildcards", "*.wlp", "a.wlp", false, "", 0, 0},
-        ExcludeCase{"TrailingCommaNamesNothingMore", "a.wlp,", "", false, "", 0, 0},
-        ExcludeCase{"EmptyNamesDoNotStopTheWalk", "a.wlp,,b.wlp", "b.wlp", false, "", 0, 1},
-        ExcludeCase{"InstallationTopFile", "a.wlp", "$SRC/a.wlp", false, "", 1, 1},
-        ExcludeCase{"BareNameMissesSubfolder", "a.wlp", "$SRC/sub/a.wlp", false, "", 1, 0},
-        ExcludeCase{"RelativePath", "x.wlp, sub/a.wlp", "$SRC/sub/a.wlp", false, "", 1, 1},
-        ExcludeCase{"BackslashPath", "sub\\a.wlp", "$SRC/sub/a.wlp", false, "", 1, 1},
-        ExcludeCase{"FullPathAgainstBareList", "a.wlp", "$SRC/a.wlp", false, "", 0, 0},
-        ExcludeCase{"IniKeptSideBySide", "x.ini", "x.ini", false, "bak", 0, 1},
-        ExcludeCase{"InPlaceIniBecomesExtension", "x.ini", "x.bak", true, "bak", 0, 1},
-        ExcludeCase{"InPlaceIniNoLongerMatchesItself", "x.ini", "x.ini", true, "bak", 0, 0},
-        ExcludeCase{"InPlaceBackupOfInstallationFile", "sub/x.ini", "$SRC/sub/x.vxinibak", true,
-                    "vxinibak", 1, 1},
-        ExcludeCase{"InPlaceWithoutExtension", "x.ini", "x.", true, "", 0, 1}),
-    [](const ::testing::TestParamInfo<ExcludeCase>& info) { return info.param.name; });
-
-struct FullListCase {
-  const char* name;
-  const char* selection;
-  const char* folder;
-  const char* fixedList;
-  const char* initial;
-  const char* expected;
-};
-
-class MakeFullExclusionList : public ToolkitTest,
-                              public ::testing::WithParamInterface<FullListCase> {};
 
 // The folder holds a.wlp, b.wlp, c.wlp and files of other types.
-TEST_P(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
-  const FullListCase& c = GetParam();
+TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
+  struct Case {
+    const char* selection;
+    const char* folder;
+    const char* fixedList;
+    const char* initial;
+    const char* expected;
+  };
+  const Case cases[] = {
+      {"", "profiles", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
+      {"", "profiles", "s1.wlp", "old", "s1.wlp"},
+      {"zz.wlp", "profiles", "s1.wlp,s2.wlp", "", "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
+      {"c.wlp,a.wlp,b.wlp", "profiles", "s1.wlp", "", "s1.wlp"},
+      {" B.WLP , a.wlp", "profiles", "s1.wlp", "", "c.wlp,s1.wlp"},
+      {"a.wlp", "profiles", "", "", "b.wlp,c.wlp,"},
+      {"a.wlp", "profiles", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
+      {"a.wlp", "nosuch", "s1.wlp", "", "s1.wlp"}};
+  Installations run;
   for (const char* name : {"a.wlp", "b.wlp", "c.wlp", "notes.txt", "a.wlp.old", "sub/d.wlp"}) {
-    WriteFile(S(std::string("profiles/") + name), name);
+    WriteFile(run.Src(std::string("profiles/") + name), name);
   }
-  StartRun();
-  vxStringBase result(c.initial);
-  manager_->MakeFullExclusionList(result, c.selection, c.folder, "wlp", c.fixedList);
-  EXPECT_EQ(c.expected, result.str());
+  for (const Case& c : cases) {
+    vxStringBase result(c.initial);
+    run.manager().MakeFullExclusionList(result, c.selection, c.folder, "wlp", c.fixedList);
+    EXPECT_EQ(c.expected, result.str()) << "\"" << c.selection << "\" in " << c.folder;
+  }
 }
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, MakeFullExclusionList,
-    ::testing::Values(
-        FullListCase{"NoSelectionGivesFixedList", "", "profiles", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
-        FullListCase{"NoSelectionReplacesResult", "", "profiles", "s1.wlp", "old", "s1.wlp"},
-        FullListCase{"SelectionOfNone", "zz.wlp", "profiles", "s1.wlp,s2.wlp", "",
-                     "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
-        FullListCase{"SelectionOfAll", "c.wlp,a.wlp,b.wlp", "profiles", "s1.wlp", "", "s1.wlp"},
-        FullListCase{"SelectionWithBlanksAndCase", " B.WLP , a.wlp", "profiles", "s1.wlp", "",
-                     "c.wlp,s1.wlp"},
-        FullListCase{"EmptyFixedListLeavesComma", "a.wlp", "profiles", "", "", "b.wlp,c.wlp,"},
-        FullListCase{"AppendsToResult", "a.wlp", "profiles", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
-        FullListCase{"MissingFolderGivesFixedList", "a.wlp", "nosuch", "s1.wlp", "", "s1.wlp"}),
-    [](const ::testing::TestParamInfo<FullListCase>& info) { return info.param.name; });
 
 // What the list leaves out is exactly what IsExcludeFile then refuses.
-TEST_F(ToolkitTest, FullListAgreesWithIsExcludeFile) {
-  for (const char* name : {"keep.llp", "drop.llp", "Sample.llp"}) WriteFile(S(std::string("links/") + name), "x");
-  StartRun();
+TEST(MakeFullExclusionList, AgreesWithIsExcludeFile) {
+  Installations run;
+  for (const char* name : {"keep.llp", "drop.llp", "Sample.llp"}) {
+    WriteFile(run.Src(std::string("links/") + name), "x");
+  }
   vxStringBase list;
-  manager_->MakeFullExclusionList(list, "keep.llp", "links", "llp", "sample.llp");
-  EXPECT_EQ(0, manager_->IsExcludeFile("keep.llp", list, vxStringBase::NullStr, 0));
-  EXPECT_EQ(1, manager_->IsExcludeFile("drop.llp", list, vxStringBase::NullStr, 0));
-  EXPECT_EQ(1, manager_->IsExcludeFile("Sample.llp", list, vxStringBase::NullStr, 0));
-}
-
-TEST(SampleLists, EveryListIsBareNamesOfItsKind) {
-  const char* products[] = {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"};
-  const char* kinds[] = {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"};
-  for (const char* product : products) {
-    EXPECT_STRNE("", GetSampleFileList(product, "wlp")) << product;
-    for (const char* kind : kinds) {
-      const std::string name = std::string("[a-z0-9_]+\\.") + kind;
-      const std::regex form("(" + name + "(," + name + ")*)?");
-      EXPECT_TRUE(std::regex_match(GetSampleFileList(product, kind), form)) << product << " " << kind;
-    }
+  run.manager().MakeFullExclusionList(list, "keep.llp", "links", "llp", "sample.llp");
+  for (const char* name : {"keep.llp", "drop.llp", "Sample.llp"}) {
+    EXPECT_EQ(name[0] == 'k' ? 0 : 1, run.manager().IsExcludeFile(name, list, "", 0)) << name;
   }
 }
 
-TEST(SampleLists, ReportingServerShipsThreeProfilesAndLookupIgnoresCase) {
+TEST(SampleLists, EveryListIsBareNamesOfItsKindAndLookupIgnoresCase) {
+  for (const char* product : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
+    EXPECT_STRNE("", GetSampleFileList(product, "wlp")) << product;
+    for (const char* kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
+      const std::string name = std::string("[a-z0-9_]+\\.") + kind;
+      EXPECT_TRUE(std::regex_match(GetSampleFileList(product, kind),
+                                   std::regex("(" + name + "(," + name + ")*)?")))
+          << product << " " << kind;
+    }
+  }
+  // The reporting server ships three profiles.
   const std::string obx = GetSampleFileList("OBX", "WLP");
   EXPECT_EQ(obx, GetSampleFileList("obx", "wlp"));
   EXPECT_EQ(2, std::count(obx.begin(), obx.end(), ','));

@@ -3,162 +3,126 @@
 // the backups.
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <string>
-#include <vector>
 
-#include "foundation/inifile/ini_file.h"
-#include "migrate/toolkit_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {
 
-using Entries = std::vector<std::string>;
-
 const char kMerged[] = "INI file merged: ";
 const char kCopied[] = "INI file doesn't exist - file being copied: ";
-const char kUnableToOpen[] = "Error: Unable to open file:   ";
 
 const char kOldSettings[] = "[main]\nport=80\nuser=alice\n[old]\nkept=yes\n";
 const char kNewSettings[] = "[main]\nport=8080\ntheme=dark\n";
+const char kMergedSettings[] = "[main]\nport=8080\ntheme=dark\nuser=alice\n[old]\nkept=yes\n";
 
-std::string Value(const std::string& path, const char* section, const char* key) {
-  vxMappedINIFile file(path.c_str());
-  if (file.Open(1) != 0) return "<unreadable>";
-  return file.GetVal(section, key).str();
+TEST(MergeINIFiles, KeepsDestinationValuesAndAddsTheOldOnes) {
+  Installations run;
+  WriteFile(run.Src("conf.ini"), kOldSettings);
+  WriteFile(run.Dst("conf.ini"), kNewSettings);
+  chmod(run.Dst("conf.ini").c_str(), 0640);
+  EXPECT_EQ(0, run.manager().MergeINIFiles(run.Src("conf.ini").c_str(), run.Dst("conf.ini").c_str()));
+  EXPECT_EQ((Entries{kMerged + run.Src("conf.ini")}), run.RunLog());
+  EXPECT_EQ(kOldSettings, ReadFile(run.Src("conf.ini")));
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Dst("conf.ini")));
+  EXPECT_EQ(0640u, ModeOf(run.Dst("conf.ini")));
 }
 
-TEST_F(ToolkitTest, MergeKeepsDestinationValuesAndAddsTheOldOnes) {
-  WriteFile(S("conf.ini"), kOldSettings);
-  WriteFile(D("conf.ini"), kNewSettings);
-  chmod(D("conf.ini").c_str(), 0640);
-  StartRun();
-  EXPECT_EQ(0, manager_->MergeINIFiles(S("conf.ini").c_str(), D("conf.ini").c_str()));
-  EXPECT_EQ((Entries{kMerged + S("conf.ini")}), NewLogEntries());
-  EXPECT_EQ(kOldSettings, ReadFile(S("conf.ini")));
-  EXPECT_EQ("8080", Value(D("conf.ini"), "main", "port"));
-  EXPECT_EQ("dark", Value(D("conf.ini"), "main", "theme"));
-  EXPECT_EQ("alice", Value(D("conf.ini"), "MAIN", "user"));
-  EXPECT_EQ("yes", Value(D("conf.ini"), "old", "kept"));
-  EXPECT_EQ(0640u, ModeOf(D("conf.ini")));
+TEST(MergeINIFiles, FromAMissingSourceDoesNothingAndIntoAMissingDestinationCopies) {
+  Installations run;
+  WriteFile(run.Src("conf.ini"), kOldSettings);
+  WriteFile(run.Dst("kept.ini"), kNewSettings);
+  EXPECT_EQ(1, run.manager().MergeINIFiles(run.Src("none.ini").c_str(), run.Dst("kept.ini").c_str()));
+  EXPECT_EQ(1, run.manager().MergeINIFiles(run.Src("conf.ini").c_str(), run.Dst("new/conf.ini").c_str()));
+  EXPECT_EQ((Entries{kCopied + run.Src("conf.ini")}), run.RunLog());
+  EXPECT_EQ(kNewSettings, ReadFile(run.Dst("kept.ini")));
+  EXPECT_EQ(kOldSettings, ReadFile(run.Dst("new/conf.ini")));
 }
 
-TEST_F(ToolkitTest, MergeOfAMissingSourceDoesNothing) {
-  WriteFile(D("conf.ini"), kNewSettings);
-  StartRun();
-  EXPECT_EQ(1, manager_->MergeINIFiles(S("conf.ini").c_str(), D("conf.ini").c_str()));
-  EXPECT_EQ(1, manager_->MergeINIFiles(S("loop.ini").c_str(), D("conf.ini").c_str()));
-  EXPECT_TRUE(NewLogEntries().empty());
-  EXPECT_EQ(kNewSettings, ReadFile(D("conf.ini")));
+// A file the model cannot load (binary) or read is reported, and both come out exactly as they went
+// in, with no temporary file left beside them.
+TEST(MergeINIFiles, AnUnloadableFileOnEitherSideIsReportedAndNothingIsWritten) {
+  struct Case {
+    bool destinationSide;
+    std::string content;
+    unsigned int mode;
+  };
+  for (const Case& c : {Case{true, std::string("[a]\nk=\0v\n", 9), 0644}, Case{true, "[a]\nk=v\n", 0},
+                        Case{false, std::string("\x7f" "ELF\0\0\0", 7), 0644},
+                        Case{false, "[a]\nk=v\n", 0}}) {
+    if (c.mode == 0 && RunningAsRoot()) continue;  // root reads every file
+    SCOPED_TRACE(std::string(c.destinationSide ? "destination " : "source ") +
+                 (c.mode == 0 ? "unreadable" : "binary"));
+    Installations run;
+    const std::string bad = c.destinationSide ? run.Dst("conf.ini") : run.Src("conf.ini");
+    const std::string good = c.destinationSide ? run.Src("conf.ini") : run.Dst("conf.ini");
+    WriteFile(bad, c.content);
+    WriteFile(good, kNewSettings);
+    chmod(bad.c_str(), c.mode);
+    EXPECT_EQ(1, run.manager().MergeINIFiles(run.Src("conf.ini").c_str(), run.Dst("conf.ini").c_str()));
+    EXPECT_EQ((Entries{"Error: Unable to open file:   " + bad}), run.RunLog());
+    chmod(bad.c_str(), 0644);
+    EXPECT_EQ(c.content, ReadFile(bad));
+    EXPECT_EQ(kNewSettings, ReadFile(good));
+    EXPECT_EQ((Entries{"conf.ini"}), run.DestinationTree());
+    EXPECT_EQ((Entries{"conf.ini"}), ListTree(run.Src()));
+  }
 }
 
-TEST_F(ToolkitTest, MergeIntoAMissingDestinationCopiesTheSource) {
-  WriteFile(S("conf.ini"), kOldSettings);
-  StartRun();
-  EXPECT_EQ(1, manager_->MergeINIFiles(S("conf.ini").c_str(), D("new/conf.ini").c_str()));
-  EXPECT_EQ((Entries{kCopied + S("conf.ini")}), NewLogEntries());
-  EXPECT_EQ(kOldSettings, ReadFile(D("new/conf.ini")));
+TEST(MergeINIFilesRelative, JoinsBothInstallationFolders) {
+  Installations run;
+  WriteFile(run.Src("vantix.ini"), kOldSettings);
+  WriteFile(run.Dst("conf/renamed.ini"), kNewSettings);
+  EXPECT_EQ(0, run.manager().MergeINIFilesRelative("\\vantix.ini", "\\conf\\renamed.ini"));
+  EXPECT_EQ((Entries{kMerged + run.Src("vantix.ini")}), run.RunLog());
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Dst("conf/renamed.ini")));
 }
 
-// A destination the model cannot load (binary) or read must come out exactly as it went in.
-struct UnloadableCase {
-  const char* name;
-  bool destinationSide;
-  std::string content;
-  unsigned int mode;
-};
-
-class UnloadableFile : public ToolkitTest, public ::testing::WithParamInterface<UnloadableCase> {};
-
-TEST_P(UnloadableFile, IsReportedAndNothingIsWritten) {
-  const UnloadableCase& c = GetParam();
-  if (c.mode == 0 && RunningAsRoot()) GTEST_SKIP() << "root reads every file";
-  const std::string bad = c.destinationSide ? D("conf.ini") : S("conf.ini");
-  const std::string good = c.destinationSide ? S("conf.ini") : D("conf.ini");
-  WriteFile(bad, c.content);
-  WriteFile(good, kNewSettings);
-  chmod(bad.c_str(), c.mode);
-  StartRun();
-  EXPECT_EQ(1, manager_->MergeINIFiles(S("conf.ini").c_str(), D("conf.ini").c_str()));
-  EXPECT_EQ((Entries{kUnableToOpen + bad}), NewLogEntries());
-  chmod(bad.c_str(), 0644);
-  EXPECT_EQ(c.content, ReadFile(bad));
-  EXPECT_EQ(kNewSettings, ReadFile(good));
-  // No temporary file is left behind beside it either.
-  Entries expected = {"conf.ini"};
-  if (c.destinationSide) expected.push_back("vxmigrate.log");
-  EXPECT_EQ(expected, ListTree(c.destinationSide ? dst_ : src_));
+TEST(MergeAllINIFiles, WalksTheTreeTopFolderLastLeavingProtectedAndExcludedFiles) {
+  Installations run;
+  for (const char* name : {"top.ini", "a/one.ini"}) WriteFile(run.Dst(name), kNewSettings);
+  for (const char* name : {"top.ini", "a/one.ini", "a/b/two.ini", "a/b/skip.ini",
+                           "my conf/three four.ini", "vxm_vxx/datfiles/databases/db.ini",
+                           "vxm_vxx/datfiles/other.ini", "tools/vxmigrate/plugin.ini",
+                           "vxmigrate.ini"}) {
+    WriteFile(run.Src(name), kOldSettings);
+  }
+  WriteFile(run.Src("a/b/notes.txt"), "not settings");
+  ASSERT_EQ(0, symlink("loop.ini", run.Src("loop.ini").c_str()));
+  EXPECT_EQ(0, run.manager().MergeAllINIFiles(" a/b/skip.ini, nosuch.ini"));
+  EXPECT_EQ((Entries{kMerged + run.Src("a/one.ini"), kCopied + run.Src("a/b/two.ini"),
+                     kCopied + run.Src("my conf/three four.ini"),
+                     kCopied + run.Src("vxm_vxx/datfiles/other.ini"), kMerged + run.Src("top.ini")}),
+            run.RunLog());
+  EXPECT_EQ((Entries{"a", "a/b", "a/b/two.ini", "a/one.ini", "my conf", "my conf/three four.ini",
+                     "top.ini", "vxm_vxx", "vxm_vxx/datfiles", "vxm_vxx/datfiles/other.ini"}),
+            run.DestinationTree());
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Dst("a/one.ini")));
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Dst("top.ini")));
+  EXPECT_EQ(kOldSettings, ReadFile(run.Dst("a/b/two.ini")));
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Cases, UnloadableFile,
-    ::testing::Values(
-        UnloadableCase{"BinaryDestination", true, std::string("[a]\nk=\0v\n", 9), 0644},
-        UnloadableCase{"UnreadableDestination", true, "[a]\nk=v\n", 0},
-        UnloadableCase{"BinarySource", false, std::string("\x7f" "ELF\0\0\0", 7), 0644},
-        UnloadableCase{"UnreadableSource", false, "[a]\nk=v\n", 0}),
-    [](const ::testing::TestParamInfo<UnloadableCase>& info) { return info.param.name; });
-
-TEST_F(ToolkitTest, MergeRelativeJoinsBothInstallationFolders) {
-  WriteFile(S("vantix.ini"), kOldSettings);
-  WriteFile(D("conf/renamed.ini"), kNewSettings);
-  StartRun();
-  EXPECT_EQ(0, manager_->MergeINIFilesRelative("\\vantix.ini", "\\conf\\renamed.ini"));
-  EXPECT_EQ((Entries{kMerged + S("vantix.ini")}), NewLogEntries());
-  EXPECT_EQ("alice", Value(D("conf/renamed.ini"), "main", "user"));
-}
-
-TEST_F(ToolkitTest, MergeAllWalksTheTreeTopFolderLast) {
-  WriteFile(S("top.ini"), kOldSettings);
-  WriteFile(D("top.ini"), kNewSettings);
-  WriteFile(S("a/one.ini"), kOldSettings);
-  WriteFile(D("a/one.ini"), kNewSettings);
-  WriteFile(S("a/b/two.ini"), kOldSettings);
-  WriteFile(S("a/b/skip.ini"), kOldSettings);
-  WriteFile(S("a/b/notes.txt"), "not settings");
-  WriteFile(S("my conf/three four.ini"), kOldSettings);
-  WriteFile(S("vxm_vxx/datfiles/databases/db.ini"), kOldSettings);
-  WriteFile(S("vxm_vxx/datfiles/other.ini"), kOldSettings);
-  WriteFile(S("tools/vxmigrate/plugin.ini"), kOldSettings);
-  WriteFile(S("vxmigrate.ini"), kOldSettings);
-  ASSERT_EQ(0, symlink("loop.ini", S("loop.ini").c_str()));
-  StartRun();
-  EXPECT_EQ(0, manager_->MergeAllINIFiles(" a/b/skip.ini, nosuch.ini"));
-  EXPECT_EQ((Entries{kMerged + S("a/one.ini"), kCopied + S("a/b/two.ini"),
-                     kCopied + S("my conf/three four.ini"), kCopied + S("vxm_vxx/datfiles/other.ini"),
-                     kMerged + S("top.ini")}),
-            NewLogEntries());
-  EXPECT_EQ("8080", Value(D("a/one.ini"), "main", "port"));
-  EXPECT_EQ("alice", Value(D("top.ini"), "main", "user"));
-  EXPECT_EQ(kOldSettings, ReadFile(D("a/b/two.ini")));
-  EXPECT_FALSE(FileExists(D("a/b/skip.ini")));
-  EXPECT_FALSE(FileExists(D("vxm_vxx/datfiles/databases")));
-  EXPECT_FALSE(FileExists(D("tools")));
-  EXPECT_FALSE(FileExists(D("vxmigrate.ini")));
-}
-
-TEST_F(ToolkitTest, MergeAllInPlaceReadsTheBackups) {
-  WriteFile(S("a/b.vxinibak"), kOldSettings);
-  WriteFile(S("a/b.ini"), kNewSettings);
-  WriteFile(S("a/only.vxinibak"), kOldSettings);
-  WriteFile(S("a/skip.vxinibak"), kOldSettings);
-  WriteFile(S("a/skip.ini"), kNewSettings);
-  WriteFile(S("plain.ini"), kNewSettings);  // no backup: the installer did not replace it
-  WriteFile(S("top.vxinibak"), kOldSettings);
-  WriteFile(S("top.ini"), kNewSettings);
-  StartRun(true);
-  EXPECT_EQ(0, manager_->MergeAllINIFiles("a/skip.ini"));
-  EXPECT_EQ((Entries{kMerged + S("a/b.vxinibak"), kCopied + S("a/only.vxinibak"),
-                     kMerged + S("top.vxinibak")}),
-            NewLogEntries());
-  EXPECT_EQ("alice", Value(S("a/b.ini"), "main", "user"));
-  EXPECT_EQ("8080", Value(S("a/b.ini"), "main", "port"));
-  EXPECT_EQ(kOldSettings, ReadFile(S("a/b.vxinibak")));
-  EXPECT_EQ(kOldSettings, ReadFile(S("a/only.ini")));
-  EXPECT_EQ(kNewSettings, ReadFile(S("a/skip.ini")));
-  EXPECT_EQ(kNewSettings, ReadFile(S("plain.ini")));
-  EXPECT_EQ("alice", Value(S("top.ini"), "main", "user"));
+TEST(MergeAllINIFiles, InPlaceReadsTheBackups) {
+  Installations run(RunOptions{{}, true});
+  for (const char* name : {"a/b", "a/only", "a/skip", "top"}) {
+    WriteFile(run.Src(name + std::string(".vxinibak")), kOldSettings);
+  }
+  // "plain.ini" has no backup: the installer did not replace it.
+  for (const char* name : {"a/b.ini", "a/skip.ini", "plain.ini", "top.ini"}) {
+    WriteFile(run.Src(name), kNewSettings);
+  }
+  EXPECT_EQ(0, run.manager().MergeAllINIFiles("a/skip.ini"));
+  EXPECT_EQ((Entries{kMerged + run.Src("a/b.vxinibak"), kCopied + run.Src("a/only.vxinibak"),
+                     kMerged + run.Src("top.vxinibak")}),
+            run.RunLog());
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Src("a/b.ini")));
+  EXPECT_EQ(kOldSettings, ReadFile(run.Src("a/b.vxinibak")));
+  EXPECT_EQ(kOldSettings, ReadFile(run.Src("a/only.ini")));
+  EXPECT_EQ(kNewSettings, ReadFile(run.Src("a/skip.ini")));
+  EXPECT_EQ(kNewSettings, ReadFile(run.Src("plain.ini")));
+  EXPECT_EQ(kMergedSettings, ReadFile(run.Src("top.ini")));
 }
 
 }  // namespace

@@ -1,11 +1,19 @@
 // A source and a destination installation in a fresh temporary folder with a real manager over
-// them, for the tests of the profile and user-file operations.
+// them, for the tests of the copying, merging and profile operations; the log entries those
+// operations wrote; and the credential encodings old and new profiles hold.
 
-#ifndef VXMIGRATE_TESTS_MIGRATE_PROFILES_FIXTURE_H_
-#define VXMIGRATE_TESTS_MIGRATE_PROFILES_FIXTURE_H_
+#ifndef VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
+#define VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <initializer_list>
 #include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "crypt/protected_value.h"
@@ -14,23 +22,23 @@
 
 namespace vxtest {
 
+using Entries = std::vector<std::string>;
+
 struct RunOptions {
-  std::string sourceProduct = "pavsuite";
-  std::string destinationProduct = "pavsuite";
-  std::string sourceVersion = "5.5";
-  std::string destinationVersion = "5.5";
   std::vector<std::string> extra;  // further options: "-FT:N", "-PFLog:a.wlp"
   bool inPlace = false;            // the destination folder is the source folder
+  std::string sourceProduct = "pavsuite";
+  std::string sourceVersion = "5.5";
+  std::string destinationProduct = "pavsuite";
+  std::string destinationVersion = "5.5";
 };
 
 class Installations {
  public:
-  explicit Installations(const RunOptions& options = RunOptions()) : options_(options) {
-    MakeDirs(root_.Path("src"));
-    MakeDirs(root_.Path("dst"));
-    MakeDirs(root_.Path("bin"));
+  explicit Installations(RunOptions options = RunOptions()) : options_(std::move(options)) {
+    MakeDirs(Src());
+    MakeDirs(Dst());
   }
-
   Installations(const Installations&) = delete;
   Installations& operator=(const Installations&) = delete;
 
@@ -41,64 +49,76 @@ class Installations {
   }
   std::string Root(const std::string& relative) const { return root_.Path(relative); }
 
+  // Writes each source file named, holding its own name.
+  void WriteSources(std::initializer_list<const char*> names) const {
+    for (const char* name : names) WriteFile(Src(name), name);
+  }
+
   // The manager, built on first use so that a test can lay out its files first.
   vxMigrationManager& manager() {
     if (!manager_) {
-      std::vector<std::string> args = {root_.Path("bin/vxmigrate"), "-D1:" + Src(), "-D2:" + Dst(),
-                                       "-P1:" + options_.sourceProduct,
-                                       "-P2:" + options_.destinationProduct,
-                                       "-V1:" + options_.sourceVersion,
-                                       "-V2:" + options_.destinationVersion};
+      Entries args = {"-D1:" + Src(), "-D2:" + Dst(), "-P1:" + options_.sourceProduct,
+                      "-P2:" + options_.destinationProduct, "-V1:" + options_.sourceVersion,
+                      "-V2:" + options_.destinationVersion};
       args.insert(args.end(), options_.extra.begin(), options_.extra.end());
-      manager_ = MakeManager(args);
-      headerEntries_ = LogEntries(LogPath()).size();
+      Start(args);
     }
     return *manager_;
   }
-
-  // Builds the manager from a command file alone: "-cmd:<folder>" naming the folder that holds
-  // "migcmd.ini".
-  vxMigrationManager& ManagerFromCommandFile(const std::string& commandFolder) {
-    manager_ = MakeManager({root_.Path("bin/vxmigrate"), "-cmd:" + commandFolder});
-    headerEntries_ = LogEntries(LogPath()).size();
+  // The manager of "-cmd:<folder>" alone, the folder holding "migcmd.ini".
+  vxMigrationManager& ManagerFromCommandFile(const std::string& folder) {
+    Start({"-cmd:" + folder});
     return *manager_;
   }
 
   // The log entries written since the manager's header, time stamps removed.
-  std::vector<std::string> RunLog() const {
-    std::vector<std::string> entries = LogEntries(LogPath());
-    if (entries.size() <= headerEntries_) return {};
-    return std::vector<std::string>(entries.begin() + static_cast<long>(headerEntries_),
-                                    entries.end());
+  Entries RunLog() const {
+    Entries entries = LogEntries(Dst("vxmigrate.log"));
+    entries.erase(entries.begin(),
+                  entries.begin() + static_cast<long>(std::min(headerEntries_, entries.size())));
+    return entries;
   }
-
   // Every entry below the destination folder except the run log.
-  std::vector<std::string> DestinationTree() const {
-    std::vector<std::string> tree;
+  Entries DestinationTree() const {
+    Entries tree;
     for (const std::string& name : ListTree(Dst())) {
       if (name != "vxmigrate.log") tree.push_back(name);
     }
     return tree;
   }
 
-  static std::unique_ptr<vxMigrationManager> MakeManager(std::vector<std::string> args) {
+ private:
+  void Start(Entries args) {
+    args.insert(args.begin(), root_.Path("bin/vxmigrate"));
     std::vector<char*> argv;
     for (std::string& arg : args) argv.push_back(&arg[0]);
     argv.push_back(nullptr);
-    return std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
+    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
+    EXPECT_TRUE(manager_->IsValid());
+    headerEntries_ = LogEntries(Dst("vxmigrate.log")).size();
   }
-
- private:
   std::string Join(const std::string& top, const std::string& relative) const {
     return relative.empty() ? root_.Path(top) : root_.Path(top + "/" + relative);
   }
-  std::string LogPath() const { return Dst("vxmigrate.log"); }
 
   TempDir root_;
   RunOptions options_;
   std::unique_ptr<vxMigrationManager> manager_;
   size_t headerEntries_ = 0;
 };
+
+inline bool RunningAsRoot() { return geteuid() == 0; }
+
+inline std::string LinkTarget(const std::string& path) {
+  char buffer[4096];
+  const ssize_t length = readlink(path.c_str(), buffer, sizeof(buffer));
+  return length < 0 ? "<not a link>" : std::string(buffer, static_cast<size_t>(length));
+}
+
+inline unsigned int ModeOf(const std::string& path) {
+  struct stat st = {};
+  return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
+}
 
 // The previous generation's encoding of a clear text, as old profiles store credentials.
 inline std::string LegacyEncoded(const std::string& clear) {
@@ -128,4 +148,4 @@ inline std::string Protected(const std::string& clear) {
 
 }  // namespace vxtest
 
-#endif  // VXMIGRATE_TESTS_MIGRATE_PROFILES_FIXTURE_H_
+#endif  // VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
