@@ -11,107 +11,83 @@
 namespace vxtest {
 namespace {
 
+// Blanks around names, empty names and case do not count; a trailing comma names nothing more;
+// there are no wildcards. In place, a listed "x.ini" stands for the old file kept under the given
+// extension. With fromInstallation, names are paths below the source folder ("$" in a file).
 TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
-  struct Case {
-    const char* list;
-    const char* file;  // "$" stands for the source folder
-    bool inPlace;
-    const char* inPlaceExtension;
-    int fromInstallation;
-    int excluded;
-  };
+  struct Case { const char* list; bool inPlace; const char* extension; int fromInstallation;
+                Entries excluded; Entries kept; };
   const Case cases[] = {
-      {"", "a.wlp", false, "", 0, 0},
-      {"a.wlp, b.wlp", "b.wlp", false, "", 0, 1},
-      {" \ta.wlp\t ,  b.wlp  ", "a.wlp", false, "", 0, 1},
-      {"x.wlp, my site.wlp", "my site.wlp", false, "", 0, 1},
-      {"A.WLP", "a.wlp", false, "", 0, 1},
-      {"*.wlp", "a.wlp", false, "", 0, 0},       // no wildcards
-      {"a.wlp,", "", false, "", 0, 0},           // a trailing comma names nothing more
-      {"a.wlp,,b.wlp", "b.wlp", false, "", 0, 1},  // an empty name does not end the list
-      {"a.wlp", "$/a.wlp", false, "", 1, 1},
-      {"a.wlp", "$/sub/a.wlp", false, "", 1, 0},
-      {"x.wlp, sub/a.wlp", "$/sub/a.wlp", false, "", 1, 1},
-      {"sub\\a.wlp", "$/sub/a.wlp", false, "", 1, 1},
-      {"a.wlp", "$/a.wlp", false, "", 0, 0},
-      {"x.ini", "x.ini", false, "bak", 0, 1},
-      {"x.ini", "x.bak", true, "bak", 0, 1},  // in place, "x.ini" stands for the old file
-      {"x.ini", "x.ini", true, "bak", 0, 0},
-      {"sub/x.ini", "$/sub/x.vxinibak", true, "vxinibak", 1, 1},
-      {"x.ini", "x.", true, "", 0, 1}};
+      {"", false, "", 0, {}, {"a.wlp", ""}},
+      {" \ta.wlp\t , my site.wlp,,B.WLP,*.x,", false, "", 0, {"a.wlp", "my site.wlp", "b.wlp"},
+       {"c.x", "", "$/a.wlp"}},
+      {"a.wlp, sub/b.wlp,sub\\c.wlp", false, "", 1, {"$/a.wlp", "$/sub/b.wlp", "$/sub/c.wlp"},
+       {"$/sub/a.wlp", "a.wlp"}},
+      {"x.ini", false, "bak", 0, {"x.ini"}, {"x.bak"}},
+      {"x.ini", true, "bak", 0, {"x.bak"}, {"x.ini"}},
+      {"x.ini, sub/y.ini", true, "vxinibak", 1, {"$/x.vxinibak", "$/sub/y.vxinibak"}, {"$/x.ini"}},
+      {"x.ini", true, "", 0, {"x."}, {"x.ini"}}};
   Installations sideBySide;
   Installations inPlace(RunOptions{{}, true});
   for (const Case& c : cases) {
     Installations& run = c.inPlace ? inPlace : sideBySide;
-    std::string file = c.file;
-    if (file[0] == '$') file.replace(0, 1, run.Src());
-    EXPECT_EQ(c.excluded, run.manager().IsExcludeFile(file.c_str(), c.list, c.inPlaceExtension,
-                                                       c.fromInstallation))
-        << "\"" << c.list << "\" " << c.file << (c.inPlace ? " in place" : "");
+    for (int excluded : {1, 0}) {
+      for (std::string file : excluded ? c.excluded : c.kept) {
+        if (!file.empty() && file[0] == '$') file.replace(0, 1, run.Src());
+        EXPECT_EQ(excluded, run.manager().IsExcludeFile(file.c_str(), c.list, c.extension,
+                                                         c.fromInstallation))
+            << "\"" << c.list << "\" " << file << (c.inPlace ? " in place" : "");
+      }
+    }
   }
   EXPECT_EQ(Entries{}, sideBySide.RunLog());
   EXPECT_EQ(Entries{}, inPlace.RunLog());
 }
 
-// The folder holds a.wlp, b.wlp, c.wlp and files of other types.
+// The folder holds a.wlp, b.wlp, c.wlp and files of other types; what the list leaves out is
+// exactly what IsExcludeFile then refuses.
 TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
-  struct Case {
-    const char* selection;
-    const char* folder;
-    const char* fixedList;
-    const char* initial;
-    const char* expected;
-  };
+  struct Case { const char* selection; const char* folder; const char* fixedList;
+                const char* initial; const char* expected; };
   const Case cases[] = {
-      {"", "profiles", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
-      {"", "profiles", "s1.wlp", "old", "s1.wlp"},
-      {"zz.wlp", "profiles", "s1.wlp,s2.wlp", "", "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
-      {"c.wlp,a.wlp,b.wlp", "profiles", "s1.wlp", "", "s1.wlp"},
-      {" B.WLP , a.wlp", "profiles", "s1.wlp", "", "c.wlp,s1.wlp"},
-      {"a.wlp", "profiles", "", "", "b.wlp,c.wlp,"},
-      {"a.wlp", "profiles", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
+      {"", "p", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
+      {"", "p", "s1.wlp", "old", "s1.wlp"},
+      {"zz.wlp", "p", "s1.wlp,s2.wlp", "", "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
+      {"c.wlp,a.wlp,b.wlp", "p", "s1.wlp", "", "s1.wlp"},
+      {" B.WLP , a.wlp", "p", "s1.wlp", "", "c.wlp,s1.wlp"},
+      {"a.wlp", "p", "", "", "b.wlp,c.wlp,"},
+      {"a.wlp", "p", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
       {"a.wlp", "nosuch", "s1.wlp", "", "s1.wlp"}};
   Installations run;
-  for (const char* name : {"a.wlp", "b.wlp", "c.wlp", "notes.txt", "a.wlp.old", "sub/d.wlp"}) {
-    WriteFile(run.Src(std::string("profiles/") + name), name);
-  }
+  run.WriteSources({"p/a.wlp", "p/b.wlp", "p/c.wlp", "p/notes.txt", "p/a.wlp.old", "p/sub/d.wlp"});
   for (const Case& c : cases) {
-    vxStringBase result(c.initial);
-    run.manager().MakeFullExclusionList(result, c.selection, c.folder, "wlp", c.fixedList);
-    EXPECT_EQ(c.expected, result.str()) << "\"" << c.selection << "\" in " << c.folder;
-  }
-}
-
-// What the list leaves out is exactly what IsExcludeFile then refuses.
-TEST(MakeFullExclusionList, AgreesWithIsExcludeFile) {
-  Installations run;
-  for (const char* name : {"keep.llp", "drop.llp", "Sample.llp"}) {
-    WriteFile(run.Src(std::string("links/") + name), "x");
-  }
-  vxStringBase list;
-  run.manager().MakeFullExclusionList(list, "keep.llp", "links", "llp", "sample.llp");
-  for (const char* name : {"keep.llp", "drop.llp", "Sample.llp"}) {
-    EXPECT_EQ(name[0] == 'k' ? 0 : 1, run.manager().IsExcludeFile(name, list, "", 0)) << name;
+    vxStringBase list(c.initial);
+    run.manager().MakeFullExclusionList(list, c.selection, c.folder, "wlp", c.fixedList);
+    EXPECT_EQ(c.expected, list.str()) << "\"" << c.selection << "\" in " << c.folder;
+    if (c.initial[0] != '\0') continue;
+    for (const char* name : {"a.wlp", "b.wlp", "c.wlp", "s1.wlp"}) {
+      EXPECT_EQ(std::string(c.expected).find(name) != std::string::npos ? 1 : 0,
+                run.manager().IsExcludeFile(name, list, "", 0)) << c.expected << " " << name;
+    }
   }
 }
 
 TEST(SampleLists, EveryListIsBareNamesOfItsKindAndLookupIgnoresCase) {
   for (const char* product : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
     EXPECT_STRNE("", GetSampleFileList(product, "wlp")) << product;
-    for (const char* kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
-      const std::string name = std::string("[a-z0-9_]+\\.") + kind;
-      EXPECT_TRUE(std::regex_match(GetSampleFileList(product, kind),
+    for (const std::string kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
+      const std::string name = "[a-z0-9_]+\\." + kind;
+      EXPECT_TRUE(std::regex_match(GetSampleFileList(product, kind.c_str()),
                                    std::regex("(" + name + "(," + name + ")*)?")))
           << product << " " << kind;
     }
   }
-  // The reporting server ships three profiles.
-  const std::string obx = GetSampleFileList("OBX", "WLP");
+  const std::string obx = GetSampleFileList("OBX", "WLP");  // the reporting server ships three
   EXPECT_EQ(obx, GetSampleFileList("obx", "wlp"));
   EXPECT_EQ(2, std::count(obx.begin(), obx.end(), ','));
-  EXPECT_STREQ("", GetSampleFileList("nosuch", "wlp"));
-  EXPECT_STREQ("", GetSampleFileList("obx", "nosuch"));
-  EXPECT_STREQ("", GetSampleFileList(nullptr, "wlp"));
+  EXPECT_EQ((Entries{"", "", ""}), (Entries{GetSampleFileList("nosuch", "wlp"),
+                                             GetSampleFileList("obx", "nosuch"),
+                                             GetSampleFileList(nullptr, "wlp")}));
 }
 
 }  // namespace

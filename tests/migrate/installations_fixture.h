@@ -1,6 +1,7 @@
 // A source and a destination installation in a fresh temporary folder with a real manager over
-// them, for the tests of the copying, merging and profile operations; the log entries those
-// operations wrote; and the credential encodings old and new profiles hold.
+// them, for the tests of the copying, merging and profile operations: the log entries and files
+// those operations wrote, with the two folders written "<src>" and "<dst>" so that expectations
+// read as plain texts; and the credential encodings old and new profiles hold.
 
 #ifndef VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 #define VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
@@ -25,12 +26,10 @@ namespace vxtest {
 using Entries = std::vector<std::string>;
 
 struct RunOptions {
-  std::vector<std::string> extra;  // further options: "-FT:N", "-PFLog:a.wlp"
-  bool inPlace = false;            // the destination folder is the source folder
-  std::string sourceProduct = "pavsuite";
-  std::string sourceVersion = "5.5";
-  std::string destinationProduct = "pavsuite";
-  std::string destinationVersion = "5.5";
+  Entries extra;        // further options: "-FT:N", "-PFLog:a.wlp"
+  bool inPlace = false;  // the destination folder is the source folder
+  std::string sourceProduct = "pavsuite", sourceVersion = "5.5";
+  std::string destinationProduct = "pavsuite", destinationVersion = "5.5";
 };
 
 class Installations {
@@ -47,8 +46,6 @@ class Installations {
   std::string Dst(const std::string& relative = "") const {
     return options_.inPlace ? Src(relative) : Join("dst", relative);
   }
-  std::string Root(const std::string& relative) const { return root_.Path(relative); }
-
   // Writes each source file named, holding its own name.
   void WriteSources(std::initializer_list<const char*> names) const {
     for (const char* name : names) WriteFile(Src(name), name);
@@ -71,25 +68,36 @@ class Installations {
     return *manager_;
   }
 
+  std::string Marked(std::string text) const {
+    for (const auto& [folder, mark] : {std::make_pair(Src(), "<src>"), std::make_pair(Dst(), "<dst>")}) {
+      for (size_t at = text.find(folder); at != std::string::npos; at = text.find(folder, at)) {
+        text.replace(at, folder.size(), mark);
+      }
+    }
+    return text;
+  }
   // The log entries written since the manager's header, time stamps removed.
   Entries RunLog() const {
     Entries entries = LogEntries(Dst("vxmigrate.log"));
-    entries.erase(entries.begin(),
-                  entries.begin() + static_cast<long>(std::min(headerEntries_, entries.size())));
+    entries.erase(entries.begin(), entries.begin() + static_cast<long>(std::min(headerEntries_, entries.size())));
+    for (std::string& entry : entries) entry = Marked(entry);
     return entries;
+  }
+  Entries ReadDst(std::initializer_list<std::string> names) const {
+    Entries contents;
+    for (const std::string& name : names) contents.push_back(Marked(ReadFile(Dst(name))));
+    return contents;
   }
   // Every entry below the destination folder except the run log.
   Entries DestinationTree() const {
-    Entries tree;
-    for (const std::string& name : ListTree(Dst())) {
-      if (name != "vxmigrate.log") tree.push_back(name);
-    }
+    Entries tree = ListTree(Dst());
+    tree.erase(std::remove(tree.begin(), tree.end(), "vxmigrate.log"), tree.end());
     return tree;
   }
 
  private:
   void Start(Entries args) {
-    args.insert(args.begin(), root_.Path("bin/vxmigrate"));
+    args.insert(args.begin(), Join("bin/vxmigrate", ""));
     std::vector<char*> argv;
     for (std::string& arg : args) argv.push_back(&arg[0]);
     argv.push_back(nullptr);
@@ -109,41 +117,32 @@ class Installations {
 
 inline bool RunningAsRoot() { return geteuid() == 0; }
 
-inline std::string LinkTarget(const std::string& path) {
-  char buffer[4096];
-  const ssize_t length = readlink(path.c_str(), buffer, sizeof(buffer));
-  return length < 0 ? "<not a link>" : std::string(buffer, static_cast<size_t>(length));
-}
-
 inline unsigned int ModeOf(const std::string& path) {
   struct stat st = {};
   return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
 }
 
 // The previous generation's encoding of a clear text, as old profiles store credentials.
-inline std::string LegacyEncoded(const std::string& clear) {
-  std::vector<char> text(clear.begin(), clear.end());
-  text.push_back('\0');
-  Obsolete_EncodePasswordOrUserName(text.data());
-  return std::string(text.data());
+inline std::string LegacyEncoded(std::string clear) {
+  Obsolete_EncodePasswordOrUserName(&clear[0]);
+  return clear.c_str();
 }
 
 // The clear text behind a stored value; "<undecryptable>" when it does not decrypt.
-inline std::string Decrypted(const std::string& stored) {
-  std::vector<char> input(stored.begin(), stored.end());
-  input.push_back('\0');
+inline std::string Decrypted(std::string stored) {
   std::vector<unsigned char> output(1024);
   unsigned long length = output.size();
-  if (VXUI_Decrypt(input.data(), output.data(), &length, nullptr) != 1) return "<undecryptable>";
+  if (VXUI_Decrypt(&stored[0], output.data(), &length, nullptr) != 1) return "<undecryptable>";
   return std::string(output.begin(), output.begin() + static_cast<long>(length));
 }
 
 // The protected form of a clear text.
-inline std::string Protected(const std::string& clear) {
-  std::vector<unsigned char> data(clear.begin(), clear.end());
+inline std::string Protected(std::string clear) {
   std::vector<char> output(5 + 32 * (clear.size() / 16 + 2));
-  if (VXUI_Encrypt(data.data(), data.size(), output.data()) != 1) return "<unprotectable>";
-  return std::string(output.data());
+  if (VXUI_Encrypt(reinterpret_cast<unsigned char*>(&clear[0]), clear.size(), output.data()) != 1) {
+    return "<unprotectable>";
+  }
+  return output.data();
 }
 
 }  // namespace vxtest

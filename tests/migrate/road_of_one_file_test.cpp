@@ -19,61 +19,55 @@ std::string Value(const std::string& profile, const std::string& key) {
 TEST(RoadOfOneFile, ASelectedLogProfileArrivesProtectedAndCategorisedOnceAndForAll) {
   Installations run(RunOptions{{"-PFLog:Sales.wlp"}, false, "pavsuite", "5.5", "halsuite", "6.5"});
   const std::string legacyPassword = LegacyEncoded("Tr0ub4dor&3");
-  const std::string head = "[Profile]\r\nName=Sales web site\r\nHomePageName=reports/sales/index.htm\r\n";
+  const std::string head = "[Profile]\r\nName=Sales\r\nHomePageName=reports/sales/index.htm\r\n";
   const std::string logs = "\r\n[Logs]\r\nLog1=ftp://logs.example.com/access.log\r\n";
-  WriteFile(run.Src("profiles/sales.wlp"), head + "LogFileUsername=" + LegacyEncoded("logreader") +
-                                               "\r\nLogFilePassword=" + legacyPassword + "\r\n" + logs);
-  WriteFile(run.Src("profiles/sales.dat/hits.dat"), "hits");
-  WriteFile(run.Src("profiles/support.wlp"), "[Profile]\r\nName=Support\r\n");
-  WriteFile(run.Src("profiles/demo.wlp"), "[Profile]\r\nName=Demo\r\n");
-  WriteFile(run.Src("profiles/categories.ini"),
+  WriteFile(run.Src("p/sales.wlp"), head + "LogFileUsername=" + LegacyEncoded("logreader") +
+                                        "\r\nLogFilePassword=" + legacyPassword + "\r\n" + logs);
+  run.WriteSources({"p/sales.dat/hits", "p/support.wlp", "p/demo.wlp"});
+  WriteFile(run.Src("p/categories.ini"),
             "[main]\r\nNumberOfCategories=1\r\nCategory1=Web sites\r\n[Web sites]\r\n"
-            "NumberOfProfiles=3\r\nProfile1=C:\\Vantix\\profiles\\demo.wlp\r\n"
-            "Profile2=C:\\Vantix\\profiles\\sales.wlp\r\nProfile3=C:\\Vantix\\profiles\\support.wlp\r\n"
-            "Expand=1\r\n");
-  WriteFile(run.Dst("profiles/demo.wlp"), "[Profile]\r\nName=New demo\r\n");
-  const std::string samples = "[main]\r\nNumberOfCategories=1\r\nCategory1=Samples\r\n[Samples]\r\n"
-                              "NumberOfProfiles=1\r\nProfile1=" + run.Dst("profiles/demo.wlp") +
-                              "\r\nExpand=0\r\n";
-  WriteFile(run.Dst("profiles/categories.ini"), samples);
-  EXPECT_EQ(0, run.manager().DoCopyLogProfiles("profiles", "*.wlp", "wlp", "demo.wlp"));
+            "NumberOfProfiles=3\r\nProfile1=C:\\V\\p\\demo.wlp\r\nProfile2=C:\\V\\p\\sales.wlp\r\n"
+            "Profile3=C:\\V\\p\\support.wlp\r\nExpand=1\r\n");
+  WriteFile(run.Dst("p/demo.wlp"), "[Profile]\r\nName=New demo\r\n");
+  WriteFile(run.Dst("p/categories.ini"),
+            "[main]\r\nNumberOfCategories=1\r\nCategory1=Samples\r\n[Samples]\r\nNumberOfProfiles=1\r\n"
+            "Profile1=" + run.Dst("p/demo.wlp") + "\r\nExpand=0\r\n");
+  EXPECT_EQ(0, run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "demo.wlp"));
 
   // Only the selected profile came, under its marked name, with its data folder.
-  const Entries tree = {"profiles", "profiles/categories.ini", "profiles/demo.wlp",
-                        "profiles/sales_vxmigrate.dat", "profiles/sales_vxmigrate.dat/hits.dat",
-                        "profiles/sales_vxmigrate.wlp"};
+  const Entries tree = {"p", "p/categories.ini", "p/demo.wlp", "p/sales_vxmigrate.dat",
+                        "p/sales_vxmigrate.dat/hits", "p/sales_vxmigrate.wlp"};
   EXPECT_EQ(tree, run.DestinationTree());
-  EXPECT_EQ("[Profile]\r\nName=New demo\r\n", ReadFile(run.Dst("profiles/demo.wlp")));
   // Its credentials are protected values of the old clear texts; everything else is as it was,
   // with the home page split into folder and page.
-  const std::string profile = ReadFile(run.Dst("profiles/sales_vxmigrate.wlp"));
+  const std::string profile = ReadFile(run.Dst("p/sales_vxmigrate.wlp"));
   const std::string password = Value(profile, "LogFilePassword");
   const std::string user = Value(profile, "LogFileUsername");
   ASSERT_GT(password.size(), 4u);
   EXPECT_EQ("D9", password.substr(0, 2));
   EXPECT_EQ("AB", password.substr(password.size() - 2));
   EXPECT_NE(legacyPassword, password);
-  EXPECT_EQ("Tr0ub4dor&3", Decrypted(password));
-  EXPECT_EQ("logreader", Decrypted(user));
+  EXPECT_EQ((Entries{"Tr0ub4dor&3", "logreader"}), (Entries{Decrypted(password), Decrypted(user)}));
   EXPECT_EQ(head + "LogFileUsername=" + user + "\r\nLogFilePassword=" + password +
                 "\r\nHomePageDefaults=index.htm\r\nHomePageBaseDir=reports/sales\r\n" + logs,
             profile);
   // The new categories file keeps its own category and gains the old one, listing the copy only.
-  const std::string categories =
-      "[main]\r\nNumberOfCategories=2\r\nCategory1=Samples\r\nCategory2=Web sites\r\n" +
-      samples.substr(samples.find("[Samples]")) + "[Web sites]\r\nProfile1=" +
-      run.Dst("profiles/sales_vxmigrate.wlp") + "\r\nNumberOfProfiles=1\r\nExpand=1\r\n";
-  EXPECT_EQ(categories, ReadFile(run.Dst("profiles/categories.ini")));
-  EXPECT_EQ((Entries{"File copied:  " + run.Dst("profiles/sales_vxmigrate.wlp"),
-                     "Folder copied:  " + run.Dst("profiles/sales_vxmigrate.dat/"),
-                     "categories.ini merged: " + run.Dst("profiles/")}),
+  const Entries contents = {
+      "[Profile]\r\nName=New demo\r\n",
+      "[main]\r\nNumberOfCategories=2\r\nCategory1=Samples\r\nCategory2=Web sites\r\n"
+      "[Samples]\r\nNumberOfProfiles=1\r\nProfile1=<dst>/p/demo.wlp\r\nExpand=0\r\n"
+      "[Web sites]\r\nProfile1=<dst>/p/sales_vxmigrate.wlp\r\nNumberOfProfiles=1\r\nExpand=1\r\n"};
+  EXPECT_EQ(contents, run.ReadDst({"p/demo.wlp", "p/categories.ini"}));
+  EXPECT_EQ((Entries{"File copied:  <dst>/p/sales_vxmigrate.wlp",
+                     "Folder copied:  <dst>/p/sales_vxmigrate.dat/",
+                     "categories.ini merged: <dst>/p/"}),
             run.RunLog());
 
   // A second run finds its earlier copies and changes nothing.
-  run.manager().DoCopyLogProfiles("profiles", "*.wlp", "wlp", "demo.wlp");
+  run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "demo.wlp");
   EXPECT_EQ(tree, run.DestinationTree());
-  EXPECT_EQ(profile, ReadFile(run.Dst("profiles/sales_vxmigrate.wlp")));
-  EXPECT_EQ(categories, ReadFile(run.Dst("profiles/categories.ini")));
+  EXPECT_EQ(profile, ReadFile(run.Dst("p/sales_vxmigrate.wlp")));
+  EXPECT_EQ(contents, run.ReadDst({"p/demo.wlp", "p/categories.ini"}));
 }
 
 }  // namespace
