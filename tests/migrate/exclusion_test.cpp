@@ -28,7 +28,7 @@ TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
       {"x.ini, sub/y.ini", true, "vxinibak", 1, {"$/x.vxinibak", "$/sub/y.vxinibak"}, {"$/x.ini"}},
       {"x.ini", true, "", 0, {"x."}, {"x.ini"}}};
   Installations sideBySide;
-  Installations inPlace(RunOptions{{}, true});
+  Installations inPlace({}, true);
   for (const Case& c : cases) {
     Installations& run = c.inPlace ? inPlace : sideBySide;
     for (int excluded : {1, 0}) {
@@ -40,12 +40,9 @@ TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
       }
     }
   }
-  EXPECT_EQ(Entries{}, sideBySide.RunLog());
-  EXPECT_EQ(Entries{}, inPlace.RunLog());
 }
 
-// The folder holds a.wlp, b.wlp, c.wlp and files of other types; what the list leaves out is
-// exactly what IsExcludeFile then refuses.
+// The folder holds a.wlp, b.wlp, c.wlp and files of other types.
 TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
   struct Case { const char* selection; const char* folder; const char* fixedList;
                 const char* initial; const char* expected; };
@@ -64,22 +61,17 @@ TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
     vxStringBase list(c.initial);
     run.manager().MakeFullExclusionList(list, c.selection, c.folder, "wlp", c.fixedList);
     EXPECT_EQ(c.expected, list.str()) << "\"" << c.selection << "\" in " << c.folder;
-    if (c.initial[0] != '\0') continue;
-    for (const char* name : {"a.wlp", "b.wlp", "c.wlp", "s1.wlp"}) {
-      EXPECT_EQ(std::string(c.expected).find(name) != std::string::npos ? 1 : 0,
-                run.manager().IsExcludeFile(name, list, "", 0)) << c.expected << " " << name;
-    }
   }
 }
 
 TEST(SampleLists, EveryListIsBareNamesOfItsKindAndLookupIgnoresCase) {
-  for (const char* product : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
-    EXPECT_STRNE("", GetSampleFileList(product, "wlp")) << product;
+  for (const char* p : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
+    EXPECT_STRNE("", GetSampleFileList(p, "wlp")) << p;
     for (const std::string kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
       const std::string name = "[a-z0-9_]+\\." + kind;
-      EXPECT_TRUE(std::regex_match(GetSampleFileList(product, kind.c_str()),
+      EXPECT_TRUE(std::regex_match(GetSampleFileList(p, kind.c_str()),
                                    std::regex("(" + name + "(," + name + ")*)?")))
-          << product << " " << kind;
+          << p << " " << kind;
     }
   }
   const std::string obx = GetSampleFileList("OBX", "WLP");  // the reporting server ships three

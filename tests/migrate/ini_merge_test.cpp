@@ -62,8 +62,8 @@ TEST(MergeINIFiles, AnUnloadableFileOnEitherSideIsReportedAndNothingIsWritten) {
 
 TEST(MergeAllINIFiles, WalksTheTreeTopFolderLastLeavingProtectedAndExcludedFiles) {
   Installations run;
-  for (const char* name : {"top.ini", "a/one.ini"}) WriteFile(run.Dst(name), kNew);
-  for (const char* name : {"top.ini", "a/one.ini", "a/b/two.ini", "a/b/skip.ini", "my conf/3 4.ini",
+  for (const char* name : {"top.ini", "a/1.ini"}) WriteFile(run.Dst(name), kNew);
+  for (const char* name : {"top.ini", "a/1.ini", "a/b/2.ini", "a/b/skip.ini", "my conf/3 4.ini",
                            "vxm_vxx/datfiles/databases/db.ini", "vxm_vxx/datfiles/other.ini",
                            "tools/vxmigrate/plugin.ini", "vxmigrate.ini"}) {
     WriteFile(run.Src(name), kOld);
@@ -71,25 +71,27 @@ TEST(MergeAllINIFiles, WalksTheTreeTopFolderLastLeavingProtectedAndExcludedFiles
   WriteFile(run.Src("a/b/notes.txt"), "not settings");
   ASSERT_EQ(0, symlink("loop.ini", run.Src("loop.ini").c_str()));
   EXPECT_EQ(0, run.manager().MergeAllINIFiles(" a/b/skip.ini, nosuch.ini"));
-  EXPECT_EQ((Entries{"INI file merged: <src>/a/one.ini",
-                     "INI file doesn't exist - file being copied: <src>/a/b/two.ini",
+  EXPECT_EQ((Entries{"INI file merged: <src>/a/1.ini",
+                     "INI file doesn't exist - file being copied: <src>/a/b/2.ini",
                      "INI file doesn't exist - file being copied: <src>/my conf/3 4.ini",
                      "INI file doesn't exist - file being copied: <src>/vxm_vxx/datfiles/other.ini",
                      "INI file merged: <src>/top.ini"}),
             run.RunLog());
-  EXPECT_EQ((Entries{"a", "a/b", "a/b/two.ini", "a/one.ini", "my conf", "my conf/3 4.ini", "top.ini",
+  EXPECT_EQ((Entries{"a", "a/1.ini", "a/b", "a/b/2.ini", "my conf", "my conf/3 4.ini", "top.ini",
                      "vxm_vxx", "vxm_vxx/datfiles", "vxm_vxx/datfiles/other.ini"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{kMerged, kMerged, kOld}), run.ReadDst({"a/one.ini", "top.ini", "a/b/two.ini"}));
+  EXPECT_EQ((Entries{kMerged, kMerged, kOld}), run.ReadDst({"a/1.ini", "top.ini", "a/b/2.ini"}));
 }
 
 // "plain.ini" has no backup: the installer did not replace it.
 TEST(MergeAllINIFiles, InPlaceReadsTheBackups) {
-  Installations run(RunOptions{{}, true});
+  Installations run({}, true);
   for (const char* name : {"a/b", "a/only", "a/skip", "top"}) {
     WriteFile(run.Src(name + std::string(".vxinibak")), kOld);
   }
-  for (const char* name : {"a/b.ini", "a/skip.ini", "plain.ini", "top.ini"}) WriteFile(run.Src(name), kNew);
+  for (const char* name : {"a/b.ini", "a/skip.ini", "plain.ini", "top.ini"}) {
+    WriteFile(run.Src(name), kNew);
+  }
   EXPECT_EQ(0, run.manager().MergeAllINIFiles("a/skip.ini"));
   EXPECT_EQ((Entries{"INI file merged: <src>/a/b.vxinibak",
                      "INI file doesn't exist - file being copied: <src>/a/only.vxinibak",

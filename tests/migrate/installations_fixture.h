@@ -25,16 +25,12 @@ namespace vxtest {
 
 using Entries = std::vector<std::string>;
 
-struct RunOptions {
-  Entries extra;        // further options: "-FT:N", "-PFLog:a.wlp"
-  bool inPlace = false;  // the destination folder is the source folder
-  std::string sourceProduct = "pavsuite", sourceVersion = "5.5";
-  std::string destinationProduct = "pavsuite", destinationVersion = "5.5";
-};
-
 class Installations {
  public:
-  explicit Installations(RunOptions options = RunOptions()) : options_(std::move(options)) {
+  // extra: further options ("-FT:N", "-PFLog:a.wlp", "-V1:6.0" in place of the default);
+  // inPlace: the destination folder is the source folder.
+  explicit Installations(Entries extra = {}, bool inPlace = false)
+      : extra_(std::move(extra)), inPlace_(inPlace) {
     MakeDirs(Src());
     MakeDirs(Dst());
   }
@@ -44,7 +40,7 @@ class Installations {
   // Paths inside the two installations ("" for the installation folder itself).
   std::string Src(const std::string& relative = "") const { return Join("src", relative); }
   std::string Dst(const std::string& relative = "") const {
-    return options_.inPlace ? Src(relative) : Join("dst", relative);
+    return inPlace_ ? Src(relative) : Join("dst", relative);
   }
   // Writes each source file named, holding its own name.
   void WriteSources(std::initializer_list<const char*> names) const {
@@ -54,10 +50,9 @@ class Installations {
   // The manager, built on first use so that a test can lay out its files first.
   vxMigrationManager& manager() {
     if (!manager_) {
-      Entries args = {"-D1:" + Src(), "-D2:" + Dst(), "-P1:" + options_.sourceProduct,
-                      "-P2:" + options_.destinationProduct, "-V1:" + options_.sourceVersion,
-                      "-V2:" + options_.destinationVersion};
-      args.insert(args.end(), options_.extra.begin(), options_.extra.end());
+      Entries args = {"-D1:" + Src(), "-D2:" + Dst(), "-P1:pavsuite", "-P2:pavsuite", "-V1:5.5",
+                      "-V2:5.5"};
+      args.insert(args.end(), extra_.begin(), extra_.end());
       Start(args);
     }
     return *manager_;
@@ -69,8 +64,8 @@ class Installations {
   }
 
   std::string Marked(std::string text) const {
-    for (const auto& [folder, mark] : {std::make_pair(Src(), "<src>"), std::make_pair(Dst(), "<dst>")}) {
-      for (size_t at = text.find(folder); at != std::string::npos; at = text.find(folder, at)) {
+    for (const auto& [folder, mark] : {std::make_pair(Src(), "<src>"), {Dst(), "<dst>"}}) {
+      for (size_t at; (at = text.find(folder)) != std::string::npos;) {
         text.replace(at, folder.size(), mark);
       }
     }
@@ -79,13 +74,19 @@ class Installations {
   // The log entries written since the manager's header, time stamps removed.
   Entries RunLog() const {
     Entries entries = LogEntries(Dst("vxmigrate.log"));
-    entries.erase(entries.begin(), entries.begin() + static_cast<long>(std::min(headerEntries_, entries.size())));
+    entries.erase(entries.begin(), entries.begin() + static_cast<long>(headerEntries_));
     for (std::string& entry : entries) entry = Marked(entry);
     return entries;
   }
+  // What destination files hold; "-> target" for a link.
   Entries ReadDst(std::initializer_list<std::string> names) const {
     Entries contents;
-    for (const std::string& name : names) contents.push_back(Marked(ReadFile(Dst(name))));
+    for (const std::string& name : names) {
+      char target[4096];
+      const ssize_t length = readlink(Dst(name).c_str(), target, sizeof(target));
+      contents.push_back(length < 0 ? Marked(ReadFile(Dst(name)))
+                                    : "-> " + std::string(target, static_cast<size_t>(length)));
+    }
     return contents;
   }
   // Every entry below the destination folder except the run log.
@@ -110,7 +111,8 @@ class Installations {
   }
 
   TempDir root_;
-  RunOptions options_;
+  const Entries extra_;
+  const bool inPlace_;
   std::unique_ptr<vxMigrationManager> manager_;
   size_t headerEntries_ = 0;
 };
@@ -130,19 +132,18 @@ inline std::string LegacyEncoded(std::string clear) {
 
 // The clear text behind a stored value; "<undecryptable>" when it does not decrypt.
 inline std::string Decrypted(std::string stored) {
-  std::vector<unsigned char> output(1024);
-  unsigned long length = output.size();
-  if (VXUI_Decrypt(&stored[0], output.data(), &length, nullptr) != 1) return "<undecryptable>";
-  return std::string(output.begin(), output.begin() + static_cast<long>(length));
+  std::vector<unsigned char> clear(1024);
+  unsigned long length = clear.size();
+  if (VXUI_Decrypt(&stored[0], clear.data(), &length, nullptr) != 1) return "<undecryptable>";
+  return std::string(clear.begin(), clear.begin() + static_cast<long>(length));
 }
 
 // The protected form of a clear text.
 inline std::string Protected(std::string clear) {
   std::vector<char> output(5 + 32 * (clear.size() / 16 + 2));
-  if (VXUI_Encrypt(reinterpret_cast<unsigned char*>(&clear[0]), clear.size(), output.data()) != 1) {
-    return "<unprotectable>";
-  }
-  return output.data();
+  const int done = VXUI_Encrypt(reinterpret_cast<unsigned char*>(&clear[0]), clear.size(),
+                                output.data());
+  return done == 1 ? output.data() : "<unprotectable>";
 }
 
 }  // namespace vxtest

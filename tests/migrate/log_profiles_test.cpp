@@ -1,6 +1,9 @@
 // The migration of the user's selected log and link profiles: what the selection and the samples
 // leave behind, data folders under marked names, home-page settings, credentials turned into the
-// protected form, profiles that cannot be rewritten, and when the categories are merged.
+// protected form, profiles that cannot be rewritten, and when the categories are merged. The
+// categories merge itself: the destination's categories and entries keep their numbers, the old
+// ones are appended pointing at the profiles' new names, duplicates (also within the source) are
+// caught ignoring case while category names compare byte for byte, and the source's "Expand" wins.
 
 #include <string>
 
@@ -16,7 +19,7 @@ void LayOutLogProfiles(const Installations& run) {
 }
 
 TEST(DoCopyLogProfiles, CopiesTheSelectionWithItsDataFoldersAndReportsUnknownNames) {
-  Installations run(RunOptions{{"-PFLog:sales.wlp, WEB.WLP, ghost.wlp,ghost.wlp"}});
+  Installations run({"-PFLog:sales.wlp, WEB.WLP, ghost.wlp,ghost.wlp"});
   LayOutLogProfiles(run);
   WriteFile(run.Dst("p/web_vxmigrate.dat/h"), "from an earlier run");
   EXPECT_EQ(0, run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "sample.wlp"));
@@ -49,10 +52,8 @@ TEST(DoCopyLogProfiles, TakesSelectionAndDataFolderSwitchFromTheCommandFile) {
 
 TEST(DoCopyLogProfiles, SplitsTheHomePageIntoFolderAndPage) {
   struct Case { std::string homePage, baseDir, defaults; };
-  const Case cases[] = {{"a/b/index.htm", "a/b", "index.htm"},
-                        {"index.htm", "index.htm", ""},
-                        {"/index.htm", "", "index.htm"},
-                        {"http://host/site/", "http://host/site", ""},
+  const Case cases[] = {{"a/b/index.htm", "a/b", "index.htm"}, {"index.htm", "index.htm", ""},
+                        {"/index.htm", "", "index.htm"}, {"http://h/site/", "http://h/site", ""},
                         {"C:\\www\\index.htm", "C:\\www\\index.htm", ""}};  // no folders
   Installations run;
   for (const Case& c : cases) {
@@ -67,72 +68,135 @@ TEST(DoCopyLogProfiles, SplitsTheHomePageIntoFolderAndPage) {
   }
 }
 
-TEST(DoCopyLogProfiles, ProtectsCredentialsAndLeavesAProfileItCannotRewriteAsCopied) {
+// Protected and empty credentials are written back unchanged (how old ones are protected, the
+// road of one file shows). A binary profile, or one whose credential is too long to protect, is
+// logged and left exactly as copied.
+TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTheyAre) {
   Installations run;
   const std::string binary("[Profile]\nLogFilePassword=x\n\0\x01\x02", 31);
   const std::string longPassword = LegacyEncoded(std::string(600, 'x'));
   ASSERT_EQ(600u, longPassword.size());  // no pad byte ends the encoded text early
-  const std::string tooLong = "[Profile]\nHomePageName=a/b.htm\nLogFilePassword=" + longPassword + "\n";
+  const std::string tooLong = "[Profile]\nHomePageName=a/b.htm\nLogFilePassword=" + longPassword;
   WriteFile(run.Src("p/a.wlp"), binary);
   WriteFile(run.Src("p/b.wlp"), tooLong);
-  WriteFile(run.Src("p/c.wlp"), "[Profile]\nLogFilePassword=" + LegacyEncoded("pw") + "\n");
   WriteFile(run.Src("p/sample.wlp"), "[Profile]\n");
-  // The new installation's own profile: protected and empty values are written back unchanged.
   const std::string own = "[Profile]\nLogFilePassword=" + Protected("pw") + "\nHomePagePassword=\n";
   WriteFile(run.Dst("p/own.wlp"), own);
   run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "sample.wlp");
 
-  EXPECT_EQ((Entries{"p", "p/a_vxmigrate.wlp", "p/b_vxmigrate.wlp", "p/c_vxmigrate.wlp", "p/own.wlp"}),
+  EXPECT_EQ((Entries{"p", "p/a_vxmigrate.wlp", "p/b_vxmigrate.wlp", "p/own.wlp"}),
             run.DestinationTree());
   EXPECT_EQ((Entries{own, binary, tooLong}),
             run.ReadDst({"p/own.wlp", "p/a_vxmigrate.wlp", "p/b_vxmigrate.wlp"}));
-  const std::string good = ReadFile(run.Dst("p/c_vxmigrate.wlp"));
-  EXPECT_EQ("pw", Decrypted(good.substr(good.find('=') + 1, good.size() - good.find('=') - 2)));
-  EXPECT_EQ((Entries{"File copied:  <dst>/p/a_vxmigrate.wlp", "File copied:  <dst>/p/b_vxmigrate.wlp",
-                     "File copied:  <dst>/p/c_vxmigrate.wlp",
+  EXPECT_EQ((Entries{"File copied:  <dst>/p/a_vxmigrate.wlp",
+                     "File copied:  <dst>/p/b_vxmigrate.wlp",
                      "Error: Profile is not a valid settings file - left as copied: "
                      "<dst>/p/a_vxmigrate.wlp",
                      "Error: Value too long to protect - left unchanged, characters: 600",
-                     "Error: Value of LogFilePassword cannot be protected - profile left as copied: "
-                     "<dst>/p/b_vxmigrate.wlp"}),
+                     "Error: Value of LogFilePassword cannot be protected - profile left as "
+                     "copied: <dst>/p/b_vxmigrate.wlp"}),
             run.RunLog());
 }
 
+// Each installation keeps a categories file from 5.5, the log product from 6.5 and the firewall
+// from 3.1, each number of the version compared on its own.
 TEST(DoCopyLogProfiles, MergesTheCategoriesOnlyWhenBothVersionsKeepThem) {
-  struct Case { const char *sourceProduct, *sourceVersion, *destinationProduct, *destinationVersion;
-                bool merges; };
-  const Case cases[] = {{"pavsuite", "5.7", "halsuite", "7.9", true},
-                        {"pavsuite", "5.4", "pavsuite", "5.5", false},
-                        {"pavsuite", "6.0", "pavsuite", "6.5", false},  // numbers compared one by one
-                        {"log", "5.5", "log", "6.5", false},
-                        {"log", "6.5", "log", "6.5", true},
-                        {"bastion", "3.1", "bastion", "3.2", true}};
-  for (const Case& c : cases) {
-    SCOPED_TRACE(std::string(c.sourceProduct) + " " + c.sourceVersion + " to " +
-                 c.destinationProduct + " " + c.destinationVersion);
-    Installations run(RunOptions{{}, false, c.sourceProduct, c.sourceVersion, c.destinationProduct,
-                                 c.destinationVersion});
+  for (const auto& [options, merges] :
+       {std::make_pair(Entries{"-V1:5.7", "-P2:halsuite", "-V2:7.9"}, true), {{"-V1:5.4"}, false},
+        {{"-V1:6.0", "-V2:6.5"}, false}, {{"-P1:log", "-P2:log", "-V2:6.5"}, false},
+        {{"-P1:log", "-P2:log", "-V1:6.5", "-V2:6.5"}, true},
+        {{"-P1:bastion", "-P2:bastion", "-V1:3.1", "-V2:3.2"}, true}}) {
+    SCOPED_TRACE(::testing::PrintToString(options));
+    Installations run(options);
     run.WriteSources({"p/a.wlp"});
     WriteFile(run.Src("p/categories.ini"), "[main]\nNumberOfCategories=0\n");
     run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "");
-    EXPECT_EQ(c.merges, FileExists(run.Dst("p/categories.ini")));
-    EXPECT_EQ(c.merges, run.RunLog().back() == "categories.ini merged: <dst>/p/");
+    EXPECT_EQ(merges, FileExists(run.Dst("p/categories.ini")));
+    EXPECT_EQ(merges, run.RunLog().back() == "categories.ini merged: <dst>/p/");
   }
 }
 
 TEST(DoCopyLinkProfiles, CopiesTheSelectionWithoutDataFoldersOrCredentials) {
-  Installations run(RunOptions{{"-PFLink:b.llp"}});
+  Installations run({"-PFLink:b.llp"});
   const std::string linkProfile = "[Profile]\nLogFilePassword=" + LegacyEncoded("pw") + "\n";
   WriteFile(run.Src("l/b.llp"), linkProfile);
   run.WriteSources({"l/a.llp", "l/b.dat/h"});
   WriteFile(run.Src("l/categories.ini"), "[main]\nNumberOfCategories=1\nCategory1=L\n[L]\n"
-                                         "NumberOfProfiles=2\nProfile1=/old/a.llp\nProfile2=/old/b.llp\n");
+                                         "NumberOfProfiles=2\nProfile1=/a.llp\nProfile2=/b.llp\n");
   EXPECT_EQ(0, run.manager().DoCopyLinkProfiles("l", "*.llp", "llp", ""));
 
   EXPECT_EQ((Entries{"l", "l/b_vxmigrate.llp", "l/categories.ini"}), run.DestinationTree());
   EXPECT_EQ((Entries{linkProfile, "[main]\nNumberOfCategories=1\nCategory1=L\n[L]\nProfile1="
                                   "<dst>/l/b_vxmigrate.llp\nNumberOfProfiles=1\nExpand=\n"}),
             run.ReadDst({"l/b_vxmigrate.llp", "l/categories.ini"}));
+}
+
+TEST(MergeCategoriesINIFile, AppendsOldCategoriesAndEntriesAfterTheDestinationsOwn) {
+  Installations run;
+  WriteFile(run.Dst("p/categories.ini"),
+            "[main]\nNumberOfCategories=2\nCategory1=Sales\nCategory2=Web\n[Sales]\n"
+            "NumberOfProfiles=1\nProfile1=" + run.Dst("p/A_VXMIGRATE.WLP") + "\nExpand=0\n"
+            "[Web]\nNumberOfProfiles=0\n");
+  WriteFile(run.Src("p/categories.ini"),
+            "[main]\nNumberOfCategories=4\nCategory1=Sales\nCategory2=Support\nCategory3=sales\n"
+            "Category4=Samples\n[Sales]\nNumberOfProfiles=5\nProfile1=C:\\V\\p\\a.wlp\n"
+            "Profile2=C:\\V\\p\\b.wlp\nProfile3=/opt/v/p/B.wlp\nProfile4=C:\\V\\p\\sample.wlp\n"
+            "Profile5=c.wlp\nExpand=1\n[Support]\nNumberOfProfiles=2\nProfile1=C:\\V\\p\\d.wlp\n"
+            "Profile2=/opt/v/p/e_vxmigrate.wlp\n"
+            "[Samples]\nNumberOfProfiles=1\nProfile1=C:\\V\\p\\Sample.wlp\nExpand=1\n");
+  run.manager().MergeCategoriesINIFile("p", "*.wlp", "wlp", "x.wlp, sample.wlp", false);
+
+  EXPECT_EQ((Entries{"[main]\nNumberOfCategories=5\nCategory1=Sales\nCategory2=Web\n"
+                     "Category3=Support\nCategory4=sales\nCategory5=Samples\n"
+                     "[Sales]\nNumberOfProfiles=3\nProfile1=<dst>/p/A_VXMIGRATE.WLP\nExpand=1\n"
+                     "Profile2=<dst>/p/b_vxmigrate.wlp\nProfile3=<dst>/p/c_vxmigrate.wlp\n"
+                     "[Web]\nNumberOfProfiles=0\n[Support]\nProfile1=<dst>/p/d_vxmigrate.wlp\n"
+                     "Profile2=<dst>/p/e_vxmigrate.wlp\nNumberOfProfiles=2\nExpand=\n"
+                     "[Samples]\nNumberOfProfiles=0\nExpand=1\n"}),
+            run.ReadDst({"p/categories.ini"}));
+  EXPECT_EQ((Entries{"categories.ini merged: <dst>/p/"}), run.RunLog());
+}
+
+// Without a source file nothing happens; an unreadable file on either side is reported and
+// nothing is written.
+TEST(MergeCategoriesINIFile, NeverReplacesAnUnreadableCategoriesFileNorWorksWithoutASource) {
+  Installations run;
+  const std::string good = "[main]\nNumberOfCategories=1\nCategory1=A\n[A]\nProfile1=a.wlp\n";
+  const std::string binary("[main]\nNumberOfCategories=1\0\xff", 30);
+  for (const char* name : {"p1/categories.ini", "p2/categories.ini"}) {
+    WriteFile(run.Src(name), name[1] == '1' ? good : binary);
+    WriteFile(run.Dst(name), name[1] == '1' ? binary : good);
+  }
+  WriteFile(run.Dst("p3/categories.ini"), good);
+  for (const char* folder : {"p1", "p2", "p3", "p4"}) {
+    run.manager().MergeCategoriesINIFile(folder, "*.wlp", "wlp", "", false);
+  }
+  EXPECT_EQ((Entries{"p1", "p1/categories.ini", "p2", "p2/categories.ini", "p3",
+                     "p3/categories.ini"}),
+            run.DestinationTree());
+  EXPECT_EQ((Entries{binary, good, good}),
+            run.ReadDst({"p1/categories.ini", "p2/categories.ini", "p3/categories.ini"}));
+  EXPECT_EQ((Entries{"Error: categories.ini cannot be read - not merged: <dst>/p1/categories.ini",
+                     "Error: categories.ini cannot be read - not merged: <src>/p2/categories.ini"}),
+            run.RunLog());
+}
+
+// Counts far beyond the entries present, gaps, entries beyond the count and a key written twice:
+// the counts on disk decide, and the destination's stale entry beyond its count is taken over.
+TEST(MergeCategoriesINIFile, TakesTheCountsOnDiskAsTheListsLengthAndKeepsNamesWhenAsked) {
+  Installations run;
+  WriteFile(run.Dst("p/categories.ini"),
+            "[main]\nNumberOfCategories=1\nCategory1=A\nCategory2=B\n"
+            "[A]\nNumberOfProfiles=1\nProfile1=/x/a.wlp\nProfile2=/x/stale.wlp\n");
+  WriteFile(run.Src("p/categories.ini"),
+            "[main]\nNumberOfCategories=2000000000\nCategory1=A\nCategory3=B\n"
+            "[A]\nNumberOfProfiles=3\nProfile3=n.wlp\nProfile1=m.wlp\nProfile4=beyond.wlp\n"
+            "profile1=second spelling.wlp\nExpand=1\n");
+  run.manager().MergeCategoriesINIFile("p", "*.wlp", "wlp", "", true);
+  EXPECT_EQ((Entries{"[main]\nNumberOfCategories=2\nCategory1=A\nCategory2=B\n[A]\n"
+                     "NumberOfProfiles=3\nProfile1=/x/a.wlp\nProfile2=<dst>/p/m.wlp\n"
+                     "Profile3=<dst>/p/n.wlp\nExpand=1\n[B]\nNumberOfProfiles=0\nExpand=\n"}),
+            run.ReadDst({"p/categories.ini"}));
 }
 
 }  // namespace

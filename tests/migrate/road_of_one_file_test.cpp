@@ -17,7 +17,7 @@ std::string Value(const std::string& profile, const std::string& key) {
 }
 
 TEST(RoadOfOneFile, ASelectedLogProfileArrivesProtectedAndCategorisedOnceAndForAll) {
-  Installations run(RunOptions{{"-PFLog:Sales.wlp"}, false, "pavsuite", "5.5", "halsuite", "6.5"});
+  Installations run({"-PFLog:Sales.wlp", "-P2:halsuite", "-V2:6.5"});
   const std::string legacyPassword = LegacyEncoded("Tr0ub4dor&3");
   const std::string head = "[Profile]\r\nName=Sales\r\nHomePageName=reports/sales/index.htm\r\n";
   const std::string logs = "\r\n[Logs]\r\nLog1=ftp://logs.example.com/access.log\r\n";
@@ -30,8 +30,8 @@ TEST(RoadOfOneFile, ASelectedLogProfileArrivesProtectedAndCategorisedOnceAndForA
             "Profile3=C:\\V\\p\\support.wlp\r\nExpand=1\r\n");
   WriteFile(run.Dst("p/demo.wlp"), "[Profile]\r\nName=New demo\r\n");
   WriteFile(run.Dst("p/categories.ini"),
-            "[main]\r\nNumberOfCategories=1\r\nCategory1=Samples\r\n[Samples]\r\nNumberOfProfiles=1\r\n"
-            "Profile1=" + run.Dst("p/demo.wlp") + "\r\nExpand=0\r\n");
+            "[main]\r\nNumberOfCategories=1\r\nCategory1=Samples\r\n[Samples]\r\n"
+            "NumberOfProfiles=1\r\nProfile1=" + run.Dst("p/demo.wlp") + "\r\nExpand=0\r\n");
   EXPECT_EQ(0, run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "demo.wlp"));
 
   // Only the selected profile came, under its marked name, with its data folder.

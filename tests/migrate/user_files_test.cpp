@@ -9,45 +9,37 @@
 namespace vxtest {
 namespace {
 
-// "r_vxmigrate.wlp" was left by an earlier migration into this installation: "r.wlp" wins. The
-// destination path is logged, and the "exists" text has a single blank here.
-TEST(CopyRenamedUserFiles, CopiesUnderMarkedNamesNeverMarkingTwiceNorReplacing) {
+// "r_vxmigrate.wlp" was left by an earlier migration into this installation: "r.wlp" wins. An
+// event is kept only when the marked copy of its set is there. The destination path is logged,
+// and the user files' "exists" text has a single blank.
+TEST(CopyRenamedUserFiles, CopiesUnderMarkedNamesNeverMarkingTwiceNorReplacingAndEventsFollow) {
   Installations run;
-  run.WriteSources({"u/r.wlp", "u/r_vxmigrate.wlp", "u/orphan_vxmigrate.wlp", "u/other.wlp",
-                    "u/sample.wlp", "u/readme.txt", "u/deeper/inner.wlp"});
-  WriteFile(run.Dst("u/other_vxmigrate.rpt"), "migrated before");
-  EXPECT_EQ(0, run.manager().CopyRenamedUserFiles("u", "*.wlp", "rpt", "Sample.wlp"));
-
-  EXPECT_EQ((Entries{"u", "u/orphan_vxmigrate.rpt", "u/other_vxmigrate.rpt", "u/r_vxmigrate.rpt"}),
-            run.DestinationTree());
-  EXPECT_EQ((Entries{"u/r.wlp", "migrated before"}),
-            run.ReadDst({"u/r_vxmigrate.rpt", "u/other_vxmigrate.rpt"}));
-  EXPECT_EQ((Entries{"File copied:  <dst>/u/orphan_vxmigrate.rpt",
-                     "File exists - no copy made: <dst>/u/other_vxmigrate.rpt",
-                     "File copied:  <dst>/u/r_vxmigrate.rpt",
-                     "File exists - no copy made: <dst>/u/r_vxmigrate.rpt"}),
-            run.RunLog());
-}
-
-// The user files come first: an event is only kept when its set's marked copy is there.
-TEST(CopyScheduledEventFiles, PointsEventsAtMarkedCopiesAndDropsThoseWhoseSetStayedBehind) {
-  Installations run;
-  run.WriteSources({"s/usr_sales.wlp", "s/usr_gone.wlp"});
-  WriteFile(run.Src("s/a.evt"), "; nightly\r\n[Main]\r\nSetName = usr_sales\r\nSetExtension = wlp\r\n");
-  WriteFile(run.Src("s/b.evt"), "[Main]\nSetName=usr_gone\nSetExtension=wlp\n");
-  WriteFile(run.Src("s/c.evt"), "[Main]\nSetName=other\nSetExtension=wlp\n");
-  WriteFile(run.Src("s/d.evt"), "[Main]\nSetName=usr_sales\n");
+  run.WriteSources({"s/r.wlp", "s/r_vxmigrate.wlp", "s/orphan_vxmigrate.wlp", "s/other.wlp",
+                    "s/sample.wlp", "s/usr_x.wlp", "s/usr_gone.wlp", "s/readme.txt",
+                    "s/deeper/inner.wlp"});
+  WriteFile(run.Dst("s/other_vxmigrate.rpt"), "migrated before");
+  WriteFile(run.Src("s/a.evt"), "; nightly\r\n[Main]\r\nSetName = usr_x\r\nSetExtension = rpt\r\n");
+  WriteFile(run.Src("s/b.evt"), "[Main]\nSetName=usr_gone\nSetExtension=rpt\n");
+  WriteFile(run.Src("s/c.evt"), "[Main]\nSetName=other\nSetExtension=rpt\n");
+  WriteFile(run.Src("s/d.evt"), "[Main]\nSetName=usr_x\n");
   WriteFile(run.Dst("s/d_vxmigrate.evt"), "edited since");
-  run.manager().CopyRenamedUserFiles("s", "*.wlp", "wlp", "usr_gone.wlp");
+  EXPECT_EQ(0, run.manager().CopyRenamedUserFiles("s", "*.wlp", "rpt", "Sample.wlp, usr_gone.wlp"));
   EXPECT_EQ(0, run.manager().CopyScheduledEventFiles("s", "*.evt", "evt", "usr_*"));
 
   EXPECT_EQ((Entries{"s", "s/a_vxmigrate.evt", "s/c_vxmigrate.evt", "s/d_vxmigrate.evt",
-                     "s/usr_sales_vxmigrate.wlp"}),
+                     "s/orphan_vxmigrate.rpt", "s/other_vxmigrate.rpt", "s/r_vxmigrate.rpt",
+                     "s/usr_x_vxmigrate.rpt"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{"; nightly\r\n[Main]\r\nSetName = usr_sales_vxmigrate\r\nSetExtension = wlp\r\n",
-                     "[Main]\nSetName=other\nSetExtension=wlp\n", "edited since"}),
-            run.ReadDst({"s/a_vxmigrate.evt", "s/c_vxmigrate.evt", "s/d_vxmigrate.evt"}));
-  EXPECT_EQ((Entries{"File copied:  <dst>/s/usr_sales_vxmigrate.wlp",
+  EXPECT_EQ((Entries{"s/r.wlp", "migrated before",
+                     "; nightly\r\n[Main]\r\nSetName = usr_x_vxmigrate\r\nSetExtension = rpt\r\n",
+                     "[Main]\nSetName=other\nSetExtension=rpt\n", "edited since"}),
+            run.ReadDst({"s/r_vxmigrate.rpt", "s/other_vxmigrate.rpt", "s/a_vxmigrate.evt",
+                         "s/c_vxmigrate.evt", "s/d_vxmigrate.evt"}));
+  EXPECT_EQ((Entries{"File copied:  <dst>/s/orphan_vxmigrate.rpt",
+                     "File exists - no copy made: <dst>/s/other_vxmigrate.rpt",
+                     "File copied:  <dst>/s/r_vxmigrate.rpt",
+                     "File exists - no copy made: <dst>/s/r_vxmigrate.rpt",
+                     "File copied:  <dst>/s/usr_x_vxmigrate.rpt",
                      "Schedule Event copied:  <dst>/s/a_vxmigrate.evt",
                      "Schedule Event copied:  <dst>/s/c_vxmigrate.evt",
                      "File exists - no copy made:  <dst>/s/d_vxmigrate.evt"}),
@@ -58,7 +50,7 @@ TEST(CopyScheduledEventFiles, PointsEventsAtMarkedCopiesAndDropsThoseWhoseSetSta
 // the console folder's categories, under the profiles' own names. Recipient list keys are read
 // from "l0" up to the first one missing, so an e-mail list without "l0" has none.
 TEST(DoCopyAlertProfiles, CopiesAllButSamplesRedirectsListFilesAndMergesTheConsoleCategories) {
-  Installations run(RunOptions{{"-PFAlert:night.alp"}});
+  Installations run({"-PFAlert:night.alp"});
   run.WriteSources({"datfiles/day.alp", "datfiles/demo.alp"});
   const std::string head = "[Alert]\r\nName=night\r\n[Alert_Pager_List]\r\n";
   const std::string kept = "l1=C:\\V\\pager.lst\r\nl2=\r\n";
@@ -103,7 +95,8 @@ TEST(DoCopyLanguageFiles, CopiesOnlyTheUsersOwnLanguagesIntoTheNewFolder) {
   EXPECT_EQ((Entries{"new", "new/english.rpl", "new/english_uk.rpl", "new/italian.rpl",
                      "new/klingon.rpl"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{"new", "lang/klingon.rpl"}), run.ReadDst({"new/english.rpl", "new/klingon.rpl"}));
+  EXPECT_EQ((Entries{"new", "lang/klingon.rpl"}),
+            run.ReadDst({"new/english.rpl", "new/klingon.rpl"}));
   EXPECT_EQ((Entries{"Language file copied: <src>/lang/english_uk.rpl",
                      "Language file copied: <src>/lang/italian.rpl",
                      "Language file copied: <src>/lang/klingon.rpl"}),
