@@ -1,18 +1,95 @@
-// Copying between installations over real trees: what is copied, what is kept, what is logged and
-// in which order, how links, blanks and unreadable entries are handled, profiles with their data
-// folders, and the in-place guard of every copying operation.
+// Exclusion lists: which names a list excludes, how the user's selection becomes the list of what
+// stays behind, and the sample lists that end it. Copying between installations over real trees:
+// what is copied, what is kept, what is logged and in which order, how links, blanks and unreadable
+// entries are handled, profiles with their data folders, and the in-place guard of every copying
+// operation.
 
 #include <sys/stat.h>
 #include <sys/time.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <regex>
 #include <string>
 #include <vector>
 
 #include "migrate/installations_fixture.h"
+#include "migrate/sample_lists.h"
 
 namespace vxtest {
 namespace {
+
+// Blanks around names, empty names and case do not count; a trailing comma names nothing more;
+// there are no wildcards. In place, a listed "x.ini" stands for the old file kept under the given
+// extension. With fromInstallation, names are paths below the source folder ("$" in a file). A
+// file marked "!" is not excluded.
+TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
+  struct Case { const char* list; bool inPlace; const char* extension; int fromInstallation;
+                Entries files; };
+  const Case cases[] = {
+      {"", false, "", 0, {"!a.wlp", "!"}},
+      {" \ta.wlp\t , my site.wlp,,B.WLP,*.x,", false, "", 0,
+       {"a.wlp", "my site.wlp", "b.wlp", "!c.x", "!", "!$/a.wlp"}},
+      {"a.wlp, sub/b.wlp,sub\\c.wlp", false, "", 1,
+       {"$/a.wlp", "$/sub/b.wlp", "$/sub/c.wlp", "!$/sub/a.wlp", "!a.wlp"}},
+      {"x.ini", false, "bak", 0, {"x.ini", "!x.bak"}},
+      {"x.ini", true, "bak", 0, {"x.bak", "!x.ini"}},
+      {"x.ini, sub/y.ini", true, "vxinibak", 1, {"$/x.vxinibak", "$/sub/y.vxinibak", "!$/x.ini"}},
+      {"x.ini", true, "", 0, {"x.", "!x.ini"}}};
+  Installations sideBySide;
+  Installations inPlace({}, true);
+  for (const Case& c : cases) {
+    Installations& run = c.inPlace ? inPlace : sideBySide;
+    for (std::string file : c.files) {
+      const int excluded = file.empty() || file[0] != '!' ? 1 : 0;
+      if (!excluded) file.erase(0, 1);
+      if (!file.empty() && file[0] == '$') file.replace(0, 1, run.Src());
+      EXPECT_EQ(excluded, run.manager().IsExcludeFile(file.c_str(), c.list, c.extension,
+                                                       c.fromInstallation))
+          << "\"" << c.list << "\" " << file << (c.inPlace ? " in place" : "");
+    }
+  }
+}
+
+// The folder holds a.wlp, b.wlp, c.wlp and files of other types.
+TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
+  struct Case { const char* selection; const char* folder; const char* fixedList;
+                const char* initial; const char* expected; };
+  const Case cases[] = {
+      {"", "p", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
+      {"", "p", "s1.wlp", "old", "s1.wlp"},
+      {"zz.wlp", "p", "s1.wlp,s2.wlp", "", "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
+      {"c.wlp,a.wlp,b.wlp", "p", "s1.wlp", "", "s1.wlp"},
+      {" B.WLP , a.wlp", "p", "s1.wlp", "", "c.wlp,s1.wlp"},
+      {"a.wlp", "p", "", "", "b.wlp,c.wlp,"},
+      {"a.wlp", "p", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
+      {"a.wlp", "nosuch", "s1.wlp", "", "s1.wlp"}};
+  Installations run;
+  run.WriteSources({"p/a.wlp", "p/b.wlp", "p/c.wlp", "p/notes.txt", "p/a.wlp.old", "p/sub/d.wlp"});
+  for (const Case& c : cases) {
+    vxStringBase list(c.initial);
+    run.manager().MakeFullExclusionList(list, c.selection, c.folder, "wlp", c.fixedList);
+    EXPECT_EQ(c.expected, list.str()) << "\"" << c.selection << "\" in " << c.folder;
+  }
+}
+
+TEST(SampleLists, EveryListIsBareNamesOfItsKindAndLookupIgnoresCase) {
+  for (const char* p : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
+    EXPECT_STRNE("", GetSampleFileList(p, "wlp")) << p;
+    for (const std::string kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
+      const std::string name = "[a-z0-9_]+\\." + kind;
+      EXPECT_TRUE(std::regex_match(GetSampleFileList(p, kind.c_str()),
+                                   std::regex("(" + name + "(," + name + ")*)?")))
+          << p << " " << kind;
+    }
+  }
+  const std::string obx = GetSampleFileList("OBX", "WLP");  // the reporting server ships three
+  EXPECT_EQ(obx, GetSampleFileList("obx", "wlp"));
+  EXPECT_EQ(2, std::count(obx.begin(), obx.end(), ','));
+  for (const auto& [p, kind] : {std::make_pair("no", "wlp"), {"obx", "no"}, {nullptr, "wlp"}}) {
+    EXPECT_STREQ("", GetSampleFileList(p, kind));
+  }
+}
 
 // Excluded names are relative to the installation; blanks around them and case do not count.
 // Links are copied as links; links to folders, a folder loop among them, are never followed.
@@ -21,8 +98,7 @@ TEST(CopyAllFilesOfType, CopiesSubfoldersFirstNeverReplacesAndSkipsExcludedFiles
   run.WriteSources({"top.wlp", "kept.wlp", "readme.txt", "sub/b.wlp", "sub/deep/c.wlp",
                     "sub/deep/c.wlpx", "sub/deep/skip.wlp", "my sites/my site.wlp",
                     "my sites/skip me.wlp", "Skip.wlp"});
-  WriteFile(run.Dst("sub/b.wlp"), "new b");
-  WriteFile(run.Dst("readme.txt"), "new readme");
+  for (const char* name : {"sub/b.wlp", "readme.txt"}) WriteFile(run.Dst(name), "new");
   chmod(run.Src("sub/deep/c.wlp").c_str(), 0640);
   for (const auto& [target, link] :
        {std::make_pair("top.wlp", run.Src("alias.wlp")), {"gone.wlp", run.Src("dangling.wlp")},
@@ -47,7 +123,7 @@ TEST(CopyAllFilesOfType, CopiesSubfoldersFirstNeverReplacesAndSkipsExcludedFiles
                      "my sites/my site.wlp", "readme.txt", "sub", "sub/b.wlp", "sub/deep",
                      "sub/deep/c.wlp", "sub/deep/c.wlpx", "top.wlp"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{"new b", "new readme", "my sites/my site.wlp", "-> top.wlp", "-> gone.wlp",
+  EXPECT_EQ((Entries{"new", "new", "my sites/my site.wlp", "-> top.wlp", "-> gone.wlp",
                      "-> loop.wlp", "-> elsewhere.wlp"}),
             run.ReadDst({"sub/b.wlp", "readme.txt", "my sites/my site.wlp", "alias.wlp",
                          "dangling.wlp", "loop.wlp", "kept.wlp"}));
@@ -56,26 +132,24 @@ TEST(CopyAllFilesOfType, CopiesSubfoldersFirstNeverReplacesAndSkipsExcludedFiles
 
 // A pattern copy answers for the whole set, so the files that did not arrive are named one by one.
 TEST(CopyOperations, AnUnreadableEntryCostsOneLineAndTheRestIsCopied) {
-  if (RunningAsRoot()) GTEST_SKIP() << "root reads every file";
+  if (geteuid() == 0) GTEST_SKIP() << "root reads every file";
   Installations run;
-  run.WriteSources({"a.wlp", "secret.wlp", "locked/hidden.wlp", "z/z.wlp", "t/a.mss",
-                    "t/secret.mss", "top.mss", "hidden.mss", "kept.mss"});
+  run.WriteSources({"a.wlp", "no.wlp", "dir/in.wlp", "z/z.wlp", "t/a.mss", "t/no.mss",
+                    "top.mss", "no.mss", "kept.mss"});
   WriteFile(run.Dst("kept.mss"), "kept");
-  for (const char* name : {"secret.wlp", "locked", "t/secret.mss", "hidden.mss"}) {
-    chmod(run.Src(name).c_str(), 0);
-  }
+  for (const char* name : {"no.wlp", "dir", "t/no.mss", "no.mss"}) chmod(run.Src(name).c_str(), 0);
   run.manager().CopyAllFilesOfType("wlp", vxStringBase::NullStr);
-  run.manager().CopyFiles("secret.wlp,a.wlp", 0);
+  run.manager().CopyFiles("no.wlp,a.wlp", 0);
   EXPECT_EQ(1, run.manager().CopyFilesInRelativeFolder("t", "mss", 0));
   EXPECT_EQ(1, run.manager().CopyFilesOfType("mss", 0));
-  chmod(run.Src("locked").c_str(), 0755);
+  chmod(run.Src("dir").c_str(), 0755);
 
-  EXPECT_EQ((Entries{"Error: Unable to read folder:  <src>/locked/", "File copied:  <src>/z/z.wlp",
-                     "File copied:  <src>/a.wlp", "Error: Unable to copy file:  <src>/secret.wlp",
-                     "Error: Unable to copy file:  <src>/secret.wlp", "File copied: <src>/a.wlp",
+  EXPECT_EQ((Entries{"Error: Unable to read folder:  <src>/dir/", "File copied:  <src>/z/z.wlp",
+                     "File copied:  <src>/a.wlp", "Error: Unable to copy file:  <src>/no.wlp",
+                     "Error: Unable to copy file:  <src>/no.wlp", "File copied: <src>/a.wlp",
                      "Files copied from folder:  <src>/t/*.mss",
-                     "Error: Unable to copy file:  <src>/t/secret.mss",
-                     "Error: Unable to copy file:  <src>/hidden.mss"}),
+                     "Error: Unable to copy file:  <src>/t/no.mss",
+                     "Error: Unable to copy file:  <src>/no.mss"}),
             run.RunLog());
   EXPECT_EQ((Entries{"a.wlp", "kept.mss", "t", "t/a.mss", "top.mss", "z", "z/z.wlp"}),
             run.DestinationTree());
@@ -157,8 +231,7 @@ TEST(InPlaceRun, EveryCopyingOperationDoesNothing) {
   const std::string profile = "[Profile]\nLogFilePassword=abc\n";
   const std::string categories = "[main]\nNumberOfCategories=1\nCategory1=A\n[A]\nProfile1=a.llp\n";
   for (const char* name : {"p/a.wlp", "l/a.llp", "lang/it.rpl"}) WriteFile(run.Src(name), profile);
-  WriteFile(run.Src("p/categories.ini"), categories);
-  WriteFile(run.Src("l/categories.ini"), categories);
+  for (const char* f : {"p/categories.ini", "l/categories.ini"}) WriteFile(run.Src(f), categories);
   const Entries before = run.DestinationTree();
   vxMigrationManager& m = run.manager();
   EXPECT_EQ(std::vector<int>(14, 0),

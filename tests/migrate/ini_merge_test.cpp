@@ -3,6 +3,7 @@
 // the backups.
 
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <string>
 
@@ -41,7 +42,7 @@ TEST(MergeINIFiles, KeepsDestinationValuesAddsTheOldOnesAndCopiesIntoAMissingDes
 TEST(MergeINIFiles, AnUnloadableFileOnEitherSideIsReportedAndNothingIsWritten) {
   for (const auto& [destinationSide, mode] :
        {std::make_pair(true, 0644), {true, 0}, {false, 0644}, {false, 0}}) {
-    if (mode == 0 && RunningAsRoot()) continue;  // root reads every file
+    if (mode == 0 && geteuid() == 0) continue;  // root reads every file
     Installations run;
     const std::string bad = destinationSide ? run.Dst("c.ini") : run.Src("c.ini");
     const std::string good = destinationSide ? run.Src("c.ini") : run.Dst("c.ini");

@@ -1,7 +1,7 @@
 // A source and a destination installation in a fresh temporary folder with a real manager over
 // them, for the tests of the copying, merging and profile operations: the log entries and files
 // those operations wrote, with the two folders written "<src>" and "<dst>" so that expectations
-// read as plain texts; and the credential encodings old and new profiles hold.
+// read as plain texts; and the credential forms old and new profiles hold.
 
 #ifndef VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 #define VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
@@ -38,10 +38,8 @@ class Installations {
   Installations& operator=(const Installations&) = delete;
 
   // Paths inside the two installations ("" for the installation folder itself).
-  std::string Src(const std::string& relative = "") const { return Join("src", relative); }
-  std::string Dst(const std::string& relative = "") const {
-    return inPlace_ ? Src(relative) : Join("dst", relative);
-  }
+  std::string Src(const std::string& rel = "") const { return Join("src", rel); }
+  std::string Dst(const std::string& rel = "") const { return Join(inPlace_ ? "src" : "dst", rel); }
   // Writes each source file named, holding its own name.
   void WriteSources(std::initializer_list<const char*> names) const {
     for (const char* name : names) WriteFile(Src(name), name);
@@ -59,15 +57,12 @@ class Installations {
   }
   // The manager of "-cmd:<folder>" alone, the folder holding "migcmd.ini".
   vxMigrationManager& ManagerFromCommandFile(const std::string& folder) {
-    Start({"-cmd:" + folder});
-    return *manager_;
+    return Start({"-cmd:" + folder});
   }
 
   std::string Marked(std::string text) const {
-    for (const auto& [folder, mark] : {std::make_pair(Src(), "<src>"), {Dst(), "<dst>"}}) {
-      for (size_t at; (at = text.find(folder)) != std::string::npos;) {
-        text.replace(at, folder.size(), mark);
-      }
+    for (const auto& [f, mark] : {std::make_pair(Src(), "<src>"), {Dst(), "<dst>"}}) {
+      for (size_t at; (at = text.find(f)) != std::string::npos;) text.replace(at, f.size(), mark);
     }
     return text;
   }
@@ -80,14 +75,13 @@ class Installations {
   }
   // What destination files hold; "-> target" for a link.
   Entries ReadDst(std::initializer_list<std::string> names) const {
-    Entries contents;
+    Entries out;
     for (const std::string& name : names) {
       char target[4096];
       const ssize_t length = readlink(Dst(name).c_str(), target, sizeof(target));
-      contents.push_back(length < 0 ? Marked(ReadFile(Dst(name)))
-                                    : "-> " + std::string(target, static_cast<size_t>(length)));
+      out.push_back(length < 0 ? Marked(ReadFile(Dst(name))) : "-> " + std::string(target, length));
     }
-    return contents;
+    return out;
   }
   // Every entry below the destination folder except the run log.
   Entries DestinationTree() const {
@@ -97,7 +91,7 @@ class Installations {
   }
 
  private:
-  void Start(Entries args) {
+  vxMigrationManager& Start(Entries args) {
     args.insert(args.begin(), Join("bin/vxmigrate", ""));
     std::vector<char*> argv;
     for (std::string& arg : args) argv.push_back(&arg[0]);
@@ -105,6 +99,7 @@ class Installations {
     manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
     EXPECT_TRUE(manager_->IsValid());
     headerEntries_ = LogEntries(Dst("vxmigrate.log")).size();
+    return *manager_;
   }
   std::string Join(const std::string& top, const std::string& relative) const {
     return relative.empty() ? root_.Path(top) : root_.Path(top + "/" + relative);
@@ -117,8 +112,6 @@ class Installations {
   size_t headerEntries_ = 0;
 };
 
-inline bool RunningAsRoot() { return geteuid() == 0; }
-
 inline unsigned int ModeOf(const std::string& path) {
   struct stat st = {};
   return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
@@ -130,20 +123,14 @@ inline std::string LegacyEncoded(std::string clear) {
   return clear.c_str();
 }
 
-// The clear text behind a stored value; "<undecryptable>" when it does not decrypt.
+// The clear text behind a value in the protected form; "<not protected>" for any other value.
 inline std::string Decrypted(std::string stored) {
   std::vector<unsigned char> clear(1024);
   unsigned long length = clear.size();
-  if (VXUI_Decrypt(&stored[0], clear.data(), &length, nullptr) != 1) return "<undecryptable>";
+  unsigned int notProtected = 1;
+  const int read = VXUI_Decrypt(&stored[0], clear.data(), &length, &notProtected);
+  if (read != 1 || notProtected != 0) return "<not protected>";
   return std::string(clear.begin(), clear.begin() + static_cast<long>(length));
-}
-
-// The protected form of a clear text.
-inline std::string Protected(std::string clear) {
-  std::vector<char> output(5 + 32 * (clear.size() / 16 + 2));
-  const int done = VXUI_Encrypt(reinterpret_cast<unsigned char*>(&clear[0]), clear.size(),
-                                output.data());
-  return done == 1 ? output.data() : "<unprotectable>";
 }
 
 }  // namespace vxtest
