@@ -84,23 +84,18 @@ TEST(MergeAllINIFiles, WalksTheTreeTopFolderLastLeavingProtectedAndExcludedFiles
   EXPECT_EQ((Entries{kMerged, kMerged, kOld}), run.ReadDst({"a/1.ini", "top.ini", "a/b/2.ini"}));
 }
 
-// "plain.ini" has no backup: the installer did not replace it.
+// "p.ini" has no backup: the installer did not replace it.
 TEST(MergeAllINIFiles, InPlaceReadsTheBackups) {
   Installations run({}, true);
-  for (const char* name : {"a/b", "a/only", "a/skip", "top"}) {
-    WriteFile(run.Src(name + std::string(".vxinibak")), kOld);
-  }
-  for (const char* name : {"a/b.ini", "a/skip.ini", "plain.ini", "top.ini"}) {
-    WriteFile(run.Src(name), kNew);
-  }
-  EXPECT_EQ(0, run.manager().MergeAllINIFiles("a/skip.ini"));
+  for (std::string n : {"a/b", "a/only", "a/x", "top"}) WriteFile(run.Src(n + ".vxinibak"), kOld);
+  for (const char* n : {"a/b.ini", "a/x.ini", "p.ini", "top.ini"}) WriteFile(run.Src(n), kNew);
+  EXPECT_EQ(0, run.manager().MergeAllINIFiles("a/x.ini"));
   EXPECT_EQ((Entries{"INI file merged: <src>/a/b.vxinibak",
                      "INI file doesn't exist - file being copied: <src>/a/only.vxinibak",
                      "INI file merged: <src>/top.vxinibak"}),
             run.RunLog());
   EXPECT_EQ((Entries{kMerged, kOld, kOld, kNew, kNew, kMerged}),
-            run.ReadDst({"a/b.ini", "a/b.vxinibak", "a/only.ini", "a/skip.ini", "plain.ini",
-                         "top.ini"}));
+            run.ReadDst({"a/b.ini", "a/b.vxinibak", "a/only.ini", "a/x.ini", "p.ini", "top.ini"}));
 }
 
 }  // namespace

@@ -29,10 +29,11 @@ class Installations {
  public:
   // extra: further options ("-FT:N", "-PFLog:a.wlp", "-V1:6.0" in place of the default);
   // inPlace: the destination folder is the source folder.
-  explicit Installations(Entries extra = {}, bool inPlace = false)
-      : extra_(std::move(extra)), inPlace_(inPlace) {
+  explicit Installations(const Entries& extra = {}, bool inPlace = false) : inPlace_(inPlace) {
     MakeDirs(Src());
     MakeDirs(Dst());
+    options_.insert(options_.end(), {"-D1:" + Src(), "-D2:" + Dst()});
+    options_.insert(options_.end(), extra.begin(), extra.end());
   }
   Installations(const Installations&) = delete;
   Installations& operator=(const Installations&) = delete;
@@ -46,15 +47,7 @@ class Installations {
   }
 
   // The manager, built on first use so that a test can lay out its files first.
-  vxMigrationManager& manager() {
-    if (!manager_) {
-      Entries args = {"-D1:" + Src(), "-D2:" + Dst(), "-P1:pavsuite", "-P2:pavsuite", "-V1:5.5",
-                      "-V2:5.5"};
-      args.insert(args.end(), extra_.begin(), extra_.end());
-      Start(args);
-    }
-    return *manager_;
-  }
+  vxMigrationManager& manager() { return manager_ ? *manager_ : Start(options_); }
   // The manager of "-cmd:<folder>" alone, the folder holding "migcmd.ini".
   vxMigrationManager& ManagerFromCommandFile(const std::string& folder) {
     return Start({"-cmd:" + folder});
@@ -106,8 +99,8 @@ class Installations {
   }
 
   TempDir root_;
-  const Entries extra_;
   const bool inPlace_;
+  Entries options_ = {"-P1:pavsuite", "-P2:pavsuite", "-V1:5.5", "-V2:5.5"};
   std::unique_ptr<vxMigrationManager> manager_;
   size_t headerEntries_ = 0;
 };

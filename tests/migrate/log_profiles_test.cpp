@@ -248,12 +248,10 @@ TEST(DoCopyAlertProfiles, CopiesAllButSamplesRedirectsListFilesAndMergesTheConso
   Installations run({"-PFAlert:night.alp"});
   run.WriteSources({"datfiles/day.alp", "datfiles/demo.alp"});
   const std::string head = "[Alert]\r\nName=night\r\n[Alert_Pager_List]\r\n";
-  const std::string kept = "l1=C:\\V\\pager.lst\r\nl2=\r\n";
-  const std::string mid = "l4=LERT03.lst\r\nl5=/u/lert04.lst\r\n";
-  const std::string tail = "l8=C:\\lert09.lst\r\n[Alert_Email_List]\r\nl1=C:\\lert05.lst\r\n";
-  WriteFile(run.Src("datfiles/night.alp"), head + "l0=C:\\V\\datfiles\\lert01.lst\r\n" + kept +
-                                               "l3=lert02.txt\r\n" + mid +
-                                               "l6=D:\\lert07_vxmigrate.lst\r\n" + tail);
+  const std::string kept = "l1=C:\\V\\pager.lst\r\nl2=\r\nl4=LERT03.lst\r\nl5=/u/lert04.lst\r\n"
+                           "l8=C:\\lert09.lst\r\n[Alert_Email_List]\r\nl1=C:\\lert05.lst\r\n";
+  WriteFile(run.Src("datfiles/night.alp"), head + "l0=C:\\V\\d\\lert01.lst\r\nl3=lert02.txt\r\n"
+                                               "l6=D:\\lert07_vxmigrate.lst\r\n" + kept);
   WriteFile(run.Dst("datfiles/day_vxmigrate.alp"), "migrated before");
   WriteFile(run.Src("console_datfiles/categories.ini"),
             "[main]\nNumberOfCategories=1\nCategory1=Alerts\n[Alerts]\nNumberOfProfiles=2\n"
@@ -263,8 +261,8 @@ TEST(DoCopyAlertProfiles, CopiesAllButSamplesRedirectsListFilesAndMergesTheConso
   EXPECT_EQ((Entries{"console_datfiles", "console_datfiles/categories.ini", "datfiles",
                      "datfiles/day_vxmigrate.alp", "datfiles/night_vxmigrate.alp"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{head + "l0=lert01_vxmigrate.lst\r\n" + kept + "l3=lert02_vxmigrate.txt\r\n" +
-                         mid + "l6=lert07_vxmigrate.lst\r\n" + tail,
+  EXPECT_EQ((Entries{head + "l0=lert01_vxmigrate.lst\r\nl3=lert02_vxmigrate.txt\r\n"
+                                "l6=lert07_vxmigrate.lst\r\n" + kept,
                      "migrated before",
                      "[main]\nNumberOfCategories=1\nCategory1=Alerts\n[Alerts]\n"
                      "Profile1=<dst>/console_datfiles/night.alp\nNumberOfProfiles=1\nExpand=\n"}),
@@ -283,15 +281,13 @@ TEST(DoCopyLanguageFiles, CopiesOnlyTheUsersOwnLanguagesIntoTheNewFolder) {
   run.WriteSources({"lang/english.rpl", "lang/Spanish.rpl", "lang/GERMAN.rpl", "lang/french.rpl",
                     "lang/italian.rpl", "lang/klingon.rpl", "lang/english_uk.rpl",
                     "lang/notes.txt", "lang/old/dutch.rpl"});
-  WriteFile(run.Dst("new/english.rpl"), "new");
-  WriteFile(run.Dst("new/klingon.rpl"), "older");
-  EXPECT_EQ(0, run.manager().DoCopyLanguageFiles("lang", "new"));
+  for (const char* name : {"to/english.rpl", "to/klingon.rpl"}) WriteFile(run.Dst(name), "n");
+  EXPECT_EQ(0, run.manager().DoCopyLanguageFiles("lang", "to"));
 
-  EXPECT_EQ((Entries{"new", "new/english.rpl", "new/english_uk.rpl", "new/italian.rpl",
-                     "new/klingon.rpl"}),
+  EXPECT_EQ((Entries{"to", "to/english.rpl", "to/english_uk.rpl", "to/italian.rpl",
+                     "to/klingon.rpl"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{"new", "lang/klingon.rpl"}),
-            run.ReadDst({"new/english.rpl", "new/klingon.rpl"}));
+  EXPECT_EQ((Entries{"n", "lang/klingon.rpl"}), run.ReadDst({"to/english.rpl", "to/klingon.rpl"}));
   EXPECT_EQ((Entries{"Language file copied: <src>/lang/english_uk.rpl",
                      "Language file copied: <src>/lang/italian.rpl",
                      "Language file copied: <src>/lang/klingon.rpl"}),
