@@ -27,8 +27,9 @@ using Entries = std::vector<std::string>;
 
 class Installations {
  public:
-  // extra: further options ("-FT:N", "-PFLog:a.wlp", "-V1:6.0" in place of the default);
-  // inPlace: the destination folder is the source folder.
+  // A run from pavsuite 5.5 to pavsuite 5.5 with the further options of extra ("-FT:N",
+  // "-PFLog:a.wlp", "-V1:6.0" in place of the default); in place (the destination folder is the
+  // source folder) when inPlace is set.
   explicit Installations(const Entries& extra = {}, bool inPlace = false) : inPlace_(inPlace) {
     MakeDirs(Src());
     MakeDirs(Dst());

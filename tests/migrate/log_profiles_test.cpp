@@ -1,12 +1,8 @@
-// The migration of the user's selected log and link profiles: what the selection and the samples
-// leave behind, data folders under marked names, home-page settings, credentials turned into the
-// protected form, profiles that cannot be rewritten, and when the categories are merged. The
-// categories merge itself: the destination's categories and entries keep their numbers, the old
-// ones are appended pointing at the profiles' new names, duplicates (also within the source) are
-// caught ignoring case while category names compare byte for byte, and the source's "Expand" wins.
-// Marked copies of user files, of the scheduled events that refer to them and of alert profiles:
-// names, exclusions, existing copies left alone, no marking twice, events redirected or dropped,
-// recipient lists redirected; and the user's own report languages.
+// The user's profiles and files carried into the new installation as marked copies: log and link
+// profiles with their selection, samples, data folders, home pages and credentials; the categories
+// merge (numbers kept, old entries appended under the new names, duplicates caught, the source's
+// "Expand" winning); user files and the scheduled events that follow them; alert profiles and
+// their recipient lists; and the user's own report languages.
 
 #include <string>
 
