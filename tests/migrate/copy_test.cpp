@@ -1,249 +1,249 @@
-// Copying between installations over real trees: what is copied, what is kept, what is logged and
-// in which order, and how links, blanks and unreadable entries are handled.
+// Exclusion lists: which names a list excludes, how the user's selection becomes the list of what
+// stays behind, and the sample lists that end it. Copying between installations over real trees:
+// what is copied, what is kept, what is logged and in which order, how links, blanks and unreadable
+// entries are handled, profiles with their data folders, and the in-place guard of every copying
+// operation.
 
 #include <sys/stat.h>
 #include <sys/time.h>
 #include <unistd.h>
 
-#include <functional>
+#include <algorithm>
+#include <regex>
 #include <string>
 #include <vector>
 
-#include "migrate/toolkit_fixture.h"
+#include "migrate/installations_fixture.h"
+#include "migrate/sample_lists.h"
 
 namespace vxtest {
 namespace {
 
-using Entries = std::vector<std::string>;
-
-const char kCopiedTree[] = "File copied:  ";
-const char kExists[] = "File exists - no copy made:  ";
-
-class CopyAllFilesOfType : public ToolkitTest {
- protected:
-  // The same tree for every test: profiles at the top, in nested folders and in a folder whose
-  // name has blanks, and files of other types beside them.
-  void WriteSourceTree() {
-    WriteFile(S("top.wlp"), "top");
-    WriteFile(S("readme.txt"), "text");
-    WriteFile(S("sub/b.wlp"), "source b");
-    WriteFile(S("sub/deep/c.wlp"), "c");
-    WriteFile(S("sub/deep/c.wlpx"), "not a profile");
-    WriteFile(S("my sites/my site.wlp"), "blanks");
-    WriteFile(D("sub/b.wlp"), "the new installation's b");
+// Blanks around names, empty names and case do not count; a trailing comma names nothing more;
+// there are no wildcards. In place, a listed "x.ini" stands for the old file kept under the given
+// extension. With fromInstallation, names are paths below the source folder ("$" in a file). A
+// file marked "!" is not excluded.
+TEST(IsExcludeFile, AnswersWhetherTheListNamesTheFile) {
+  struct Case { const char* list; bool inPlace; const char* extension; int fromInstallation;
+                Entries files; };
+  const Case cases[] = {
+      {"", false, "", 0, {"!a.wlp", "!"}},
+      {" \ta.wlp\t , my site.wlp,,B.WLP,*.x,", false, "", 0,
+       {"a.wlp", "my site.wlp", "b.wlp", "!c.x", "!", "!$/a.wlp"}},
+      {"a.wlp, sub/b.wlp,sub\\c.wlp", false, "", 1,
+       {"$/a.wlp", "$/sub/b.wlp", "$/sub/c.wlp", "!$/sub/a.wlp", "!a.wlp"}},
+      {"x.ini", false, "bak", 0, {"x.ini", "!x.bak"}},
+      {"x.ini", true, "bak", 0, {"x.bak", "!x.ini"}},
+      {"x.ini, sub/y.ini", true, "vxinibak", 1, {"$/x.vxinibak", "$/sub/y.vxinibak", "!$/x.ini"}},
+      {"x.ini", true, "", 0, {"x.", "!x.ini"}}};
+  Installations sideBySide;
+  Installations inPlace({}, true);
+  for (const Case& c : cases) {
+    Installations& run = c.inPlace ? inPlace : sideBySide;
+    for (std::string file : c.files) {
+      const int excluded = file.empty() || file[0] != '!' ? 1 : 0;
+      if (!excluded) file.erase(0, 1);
+      if (!file.empty() && file[0] == '$') file.replace(0, 1, run.Src());
+      EXPECT_EQ(excluded, run.manager().IsExcludeFile(file.c_str(), c.list, c.extension,
+                                                       c.fromInstallation))
+          << "\"" << c.list << "\" " << file << (c.inPlace ? " in place" : "");
+    }
   }
-};
-
-TEST_F(CopyAllFilesOfType, CopiesTheTreeSubfoldersFirstAndKeepsExistingFiles) {
-  WriteSourceTree();
-  chmod(S("sub/deep/c.wlp").c_str(), 0640);
-  StartRun();
-  EXPECT_EQ(0, manager_->CopyAllFilesOfType("wlp", vxStringBase::NullStr));
-
-  EXPECT_EQ((Entries{Entry(kCopiedTree, "my sites/my site.wlp"), Entry(kExists, "sub/b.wlp"),
-                     Entry(kCopiedTree, "sub/deep/c.wlp"), Entry(kCopiedTree, "top.wlp")}),
-            NewLogEntries());
-  EXPECT_EQ("the new installation's b", ReadFile(D("sub/b.wlp")));
-  EXPECT_EQ("c", ReadFile(D("sub/deep/c.wlp")));
-  EXPECT_EQ("blanks", ReadFile(D("my sites/my site.wlp")));
-  EXPECT_EQ(0640u, ModeOf(D("sub/deep/c.wlp")));
-  EXPECT_FALSE(FileExists(D("readme.txt")));
-  EXPECT_FALSE(FileExists(D("sub/deep/c.wlpx")));
 }
 
-TEST_F(CopyAllFilesOfType, SkipsExcludedFilesSilently) {
-  WriteSourceTree();
-  StartRun();
-  manager_->CopyAllFilesOfType("wlp", " sub/deep/c.wlp, TOP.wlp,my sites\\my site.wlp,");
-  EXPECT_EQ((Entries{Entry(kExists, "sub/b.wlp")}), NewLogEntries());
-  EXPECT_EQ((Entries{"sub", "sub/b.wlp", "vxmigrate.log"}), ListTree(dst_));
+// The folder holds a.wlp, b.wlp, c.wlp and files of other types.
+TEST(MakeFullExclusionList, ListsWhatTheUserDidNotSelectThenTheFixedNames) {
+  struct Case { const char* selection; const char* folder; const char* fixedList;
+                const char* initial; const char* expected; };
+  const Case cases[] = {
+      {"", "p", "s1.wlp,s2.wlp", "", "s1.wlp,s2.wlp"},
+      {"", "p", "s1.wlp", "old", "s1.wlp"},
+      {"zz.wlp", "p", "s1.wlp,s2.wlp", "", "a.wlp,b.wlp,c.wlp,s1.wlp,s2.wlp"},
+      {"c.wlp,a.wlp,b.wlp", "p", "s1.wlp", "", "s1.wlp"},
+      {" B.WLP , a.wlp", "p", "s1.wlp", "", "c.wlp,s1.wlp"},
+      {"a.wlp", "p", "", "", "b.wlp,c.wlp,"},
+      {"a.wlp", "p", "s1.wlp", "pre", "pre,b.wlp,c.wlp,s1.wlp"},
+      {"a.wlp", "nosuch", "s1.wlp", "", "s1.wlp"}};
+  Installations run;
+  run.WriteSources({"p/a.wlp", "p/b.wlp", "p/c.wlp", "p/notes.txt", "p/a.wlp.old", "p/sub/d.wlp"});
+  for (const Case& c : cases) {
+    vxStringBase list(c.initial);
+    run.manager().MakeFullExclusionList(list, c.selection, c.folder, "wlp", c.fixedList);
+    EXPECT_EQ(c.expected, list.str()) << "\"" << c.selection << "\" in " << c.folder;
+  }
 }
 
-TEST_F(CopyAllFilesOfType, CopiesLinksAsLinksAndNeverFollowsFolderLinks) {
-  WriteFile(S("real.wlp"), "real");
-  ASSERT_EQ(0, symlink("real.wlp", S("alias.wlp").c_str()));
-  ASSERT_EQ(0, symlink("gone.wlp", S("dangling.wlp").c_str()));
-  ASSERT_EQ(0, symlink("loop.wlp", S("loop.wlp").c_str()));
-  WriteFile(S("sub/inner.wlp"), "inner");
-  ASSERT_EQ(0, symlink("..", S("sub/up").c_str()));   // a folder loop
-  ASSERT_EQ(0, symlink("sub", S("sublink").c_str()));
-  StartRun();
-  manager_->CopyAllFilesOfType("wlp", vxStringBase::NullStr);
-
-  EXPECT_EQ((Entries{Entry(kCopiedTree, "sub/inner.wlp"), Entry(kCopiedTree, "alias.wlp"),
-                     Entry(kCopiedTree, "dangling.wlp"), Entry(kCopiedTree, "loop.wlp"),
-                     Entry(kCopiedTree, "real.wlp")}),
-            NewLogEntries());
-  EXPECT_EQ("real.wlp", LinkTarget(D("alias.wlp")));
-  EXPECT_EQ("gone.wlp", LinkTarget(D("dangling.wlp")));
-  EXPECT_EQ("loop.wlp", LinkTarget(D("loop.wlp")));
-  EXPECT_EQ((Entries{"alias.wlp", "dangling.wlp", "loop.wlp", "real.wlp", "sub", "sub/inner.wlp",
-                     "vxmigrate.log"}),
-            ListTree(dst_));
+TEST(SampleLists, EveryListIsBareNamesOfItsKindAndLookupIgnoresCase) {
+  for (const char* p : {"halsuite", "pavsuite", "mirsuite", "log", "obx", "tqrs", "bastion"}) {
+    EXPECT_STRNE("", GetSampleFileList(p, "wlp")) << p;
+    for (const std::string kind : {"wlp", "prx", "slp", "llp", "alp", "arp", "mss"}) {
+      const std::string name = "[a-z0-9_]+\\." + kind, re = "(" + name + "(," + name + ")*)?";
+      EXPECT_TRUE(std::regex_match(GetSampleFileList(p, kind.data()), std::regex(re))) << p << kind;
+    }
+  }
+  const std::string obx = GetSampleFileList("OBX", "WLP");  // the reporting server ships three
+  EXPECT_EQ(obx, GetSampleFileList("obx", "wlp"));
+  EXPECT_EQ(2, std::count(obx.begin(), obx.end(), ','));
+  for (const auto& [p, kind] : {std::make_pair("no", "wlp"), {"obx", "no"}, {nullptr, "wlp"}}) {
+    EXPECT_STREQ("", GetSampleFileList(p, kind));
+  }
 }
 
-TEST_F(CopyAllFilesOfType, ADanglingLinkAtTheDestinationIsKept) {
-  WriteFile(S("a.wlp"), "a");
-  ASSERT_EQ(0, symlink("elsewhere.wlp", D("a.wlp").c_str()));
-  StartRun();
-  manager_->CopyAllFilesOfType("wlp", vxStringBase::NullStr);
-  EXPECT_EQ((Entries{Entry(kExists, "a.wlp")}), NewLogEntries());
-  EXPECT_EQ("elsewhere.wlp", LinkTarget(D("a.wlp")));
+// Excluded names are relative to the installation; blanks around them and case do not count.
+// Links are copied as links; links to folders, a folder loop among them, are never followed.
+TEST(CopyAllFilesOfType, CopiesSubfoldersFirstNeverReplacesAndSkipsExcludedFiles) {
+  Installations run;
+  run.WriteSources({"top.wlp", "kept.wlp", "X.wlp", "readme.txt", "sub/b.wlp", "sub/deep/c.wlp",
+                    "sub/deep/c.wlpx", "sub/deep/x.wlp", "my s/my site.wlp", "my s/x y.wlp"});
+  for (const char* name : {"sub/b.wlp", "readme.txt"}) WriteFile(run.Dst(name), "new");
+  chmod(run.Src("sub/deep/c.wlp").c_str(), 0640);
+  for (const auto& [target, link] :
+       {std::make_pair("top.wlp", run.Src("alias.wlp")), {"gone.wlp", run.Src("dangling.wlp")},
+        {"loop.wlp", run.Src("loop.wlp")}, {"..", run.Src("sub/up")}, {"sub", run.Src("sublink")},
+        {"elsewhere.wlp", run.Dst("kept.wlp")}}) {
+    ASSERT_EQ(0, symlink(target, link.c_str()));
+  }
+  EXPECT_EQ(0, run.manager().CopyAllFilesOfType("wlp", " sub/deep/X.wlp, x.wlp,my s\\x y.wlp,"));
+  // Each type in turn, never replacing whatever the option says.
+  EXPECT_EQ(0, run.manager().CopyFilesOfTypes(" wlpx, ,txt,", 1));
+
+  EXPECT_EQ((Entries{"File copied:  <src>/my s/my site.wlp",
+                     "File exists - no copy made:  <src>/sub/b.wlp",
+                     "File copied:  <src>/sub/deep/c.wlp", "File copied:  <src>/alias.wlp",
+                     "File copied:  <src>/dangling.wlp",
+                     "File exists - no copy made:  <src>/kept.wlp", "File copied:  <src>/loop.wlp",
+                     "File copied:  <src>/top.wlp", "File copied:  <src>/sub/deep/c.wlpx",
+                     "File exists - no copy made:  <src>/readme.txt"}),
+            run.RunLog());
+  EXPECT_EQ((Entries{"alias.wlp", "dangling.wlp", "kept.wlp", "loop.wlp", "my s",
+                     "my s/my site.wlp", "readme.txt", "sub", "sub/b.wlp", "sub/deep",
+                     "sub/deep/c.wlp", "sub/deep/c.wlpx", "top.wlp"}),
+            run.DestinationTree());
+  EXPECT_EQ((Entries{"new", "new", "my s/my site.wlp", "-> top.wlp", "-> gone.wlp",
+                     "-> loop.wlp", "-> elsewhere.wlp"}),
+            run.ReadDst({"sub/b.wlp", "readme.txt", "my s/my site.wlp", "alias.wlp",
+                         "dangling.wlp", "loop.wlp", "kept.wlp"}));
+  EXPECT_EQ(0640u, ModeOf(run.Dst("sub/deep/c.wlp")));
 }
 
-TEST_F(CopyAllFilesOfType, UnreadableEntriesCostOneLineEachAndTheRestIsCopied) {
-  if (RunningAsRoot()) GTEST_SKIP() << "root reads every file";
-  WriteFile(S("a.wlp"), "a");
-  WriteFile(S("secret.wlp"), "secret");
-  WriteFile(S("locked/hidden.wlp"), "hidden");
-  WriteFile(S("z/z.wlp"), "z");
-  chmod(S("secret.wlp").c_str(), 0);
-  chmod(S("locked").c_str(), 0);
-  StartRun();
-  manager_->CopyAllFilesOfType("wlp", vxStringBase::NullStr);
-  chmod(S("locked").c_str(), 0755);
+// A pattern copy answers for the whole set, so the files that did not arrive are named one by one.
+TEST(CopyOperations, AnUnreadableEntryCostsOneLineAndTheRestIsCopied) {
+  if (geteuid() == 0) GTEST_SKIP() << "root reads every file";
+  Installations run;
+  run.WriteSources({"a.wlp", "no.wlp", "dir/in.wlp", "z/z.wlp", "t/a.mss", "t/no.mss",
+                    "top.mss", "no.mss", "kept.mss"});
+  WriteFile(run.Dst("kept.mss"), "kept");
+  for (const char* name : {"no.wlp", "dir", "t/no.mss", "no.mss"}) chmod(run.Src(name).c_str(), 0);
+  run.manager().CopyAllFilesOfType("wlp", vxStringBase::NullStr);
+  run.manager().CopyFiles("no.wlp,a.wlp", 0);
+  EXPECT_EQ(1, run.manager().CopyFilesInRelativeFolder("t", "mss", 0));
+  EXPECT_EQ(1, run.manager().CopyFilesOfType("mss", 0));
+  chmod(run.Src("dir").c_str(), 0755);
 
-  EXPECT_EQ((Entries{"Error: Unable to read folder:  " + S("locked/"), Entry(kCopiedTree, "z/z.wlp"),
-                     Entry(kCopiedTree, "a.wlp"), Entry("Error: Unable to copy file:  ", "secret.wlp")}),
-            NewLogEntries());
-  EXPECT_EQ((Entries{"a.wlp", "vxmigrate.log", "z", "z/z.wlp"}), ListTree(dst_));
+  EXPECT_EQ((Entries{"Error: Unable to read folder:  <src>/dir/", "File copied:  <src>/z/z.wlp",
+                     "File copied:  <src>/a.wlp", "Error: Unable to copy file:  <src>/no.wlp",
+                     "Error: Unable to copy file:  <src>/no.wlp", "File copied: <src>/a.wlp",
+                     "Files copied from folder:  <src>/t/*.mss",
+                     "Error: Unable to copy file:  <src>/t/no.mss",
+                     "Error: Unable to copy file:  <src>/no.mss"}),
+            run.RunLog());
+  EXPECT_EQ((Entries{"a.wlp", "kept.mss", "t", "t/a.mss", "top.mss", "z", "z/z.wlp"}),
+            run.DestinationTree());
 }
 
-TEST_F(ToolkitTest, CopyFilesOfTypesCopiesEachTypeInTurnAndNeverReplaces) {
-  WriteFile(S("a.ini"), "a");
-  WriteFile(S("sub/b.dat"), "b");
-  WriteFile(S("sub/c.ini"), "c");
-  WriteFile(S("d.txt"), "d");
-  WriteFile(D("a.ini"), "new a");
-  StartRun();
-  // The option would allow replacing in CopyFilesOfType; here it changes nothing.
-  EXPECT_EQ(0, manager_->CopyFilesOfTypes(" ini, ,dat,", 1));
-  EXPECT_EQ((Entries{Entry(kCopiedTree, "sub/c.ini"), Entry(kExists, "a.ini"),
-                     Entry(kCopiedTree, "sub/b.dat")}),
-            NewLogEntries());
-  EXPECT_EQ("new a", ReadFile(D("a.ini")));
-  EXPECT_FALSE(FileExists(D("d.txt")));
-}
-
-TEST_F(ToolkitTest, CopyFilesCopiesNamedFilesAndReplacesExistingOnes) {
-  WriteFile(S("a.ini"), "old a");
-  WriteFile(S("conf/b c.ini"), "b");
-  WriteFile(D("a.ini"), "new a");
-  StartRun();
-  EXPECT_EQ(0, manager_->CopyFiles("a.ini,missing.ini,, conf\\b c.ini", 0));
-  EXPECT_EQ((Entries{"File copied: " + S("a.ini"), "File copied: " + S("conf/b c.ini")}),
-            NewLogEntries());
-  EXPECT_EQ("old a", ReadFile(D("a.ini")));
-  EXPECT_EQ("b", ReadFile(D("conf/b c.ini")));
-  EXPECT_FALSE(FileExists(D("missing.ini")));
-}
-
-TEST_F(ToolkitTest, CopyFilesWithNewerOnlyKeepsANewerDestination) {
-  WriteFile(S("a.ini"), "old a");
-  WriteFile(D("a.ini"), "new a");
+// Named files, the top folder's files of a type and one folder's files replace what is there,
+// unless their option asks to keep newer (CopyFiles) or existing (CopyFilesOfType) files.
+TEST(CopyOperations, CopiesOfNamedFilesAndOfOneFolderReplaceAsTheirOptionsSay) {
+  Installations run;
+  run.WriteSources({"a.ini", "conf/b c.ini", "n.ini", "x.dat", "y.dat", "sub/z.dat", "t/a.mss",
+                    "t/b.mss", "t/deeper/c.mss"});
+  for (const char* name : {"a.ini", "n.ini", "x.dat", "t/a.mss"}) WriteFile(run.Dst(name), "new");
   const struct timeval old[2] = {{1000000000, 0}, {1000000000, 0}};
-  utimes(S("a.ini").c_str(), old);
-  StartRun();
-  EXPECT_EQ(0, manager_->CopyFiles("a.ini", 1));
-  EXPECT_EQ("new a", ReadFile(D("a.ini")));
-  for (const std::string& entry : NewLogEntries()) EXPECT_EQ(std::string::npos, entry.find("Error"));
+  utimes(run.Src("n.ini").c_str(), old);
+  vxMigrationManager& manager = run.manager();
+  EXPECT_EQ(0, manager.CopyFiles(" , ", 0));
+  EXPECT_EQ(0, manager.CopyFiles("a.ini,missing.ini,, conf\\b c.ini", 0));
+  EXPECT_EQ(0, manager.CopyFiles("n.ini", 1));
+  manager.CopyFilesOfType("dat", 0);
+  EXPECT_EQ("new", ReadFile(run.Dst("x.dat")));
+  EXPECT_EQ(0, manager.CopyFilesOfType("dat", 1));
+  EXPECT_EQ(1, manager.CopyFilesInRelativeFolder("nosuch", "mss", 0));
+  EXPECT_EQ(0, manager.CopyFilesInRelativeFolder("\\t", "mss", 0));
+  manager.CopyFilesInRelativeFolder("t", "none", 0);
+
+  EXPECT_EQ((Entries{"File copied: <src>/a.ini", "File copied: <src>/conf/b c.ini",
+                     "Files copied from folder:  <src>/t/*.mss",
+                     "Files copied from folder:  <src>/t/*.none"}),
+            run.RunLog());
+  EXPECT_EQ((Entries{"a.ini", "conf", "conf/b c.ini", "n.ini", "t", "t/a.mss", "t/b.mss", "x.dat",
+                     "y.dat"}),
+            run.DestinationTree());
+  EXPECT_EQ((Entries{"a.ini", "new", "x.dat", "t/a.mss"}),
+            run.ReadDst({"a.ini", "n.ini", "x.dat", "t/a.mss"}));
 }
 
-TEST_F(ToolkitTest, CopyFilesReportsAnUnreadableFile) {
-  if (RunningAsRoot()) GTEST_SKIP() << "root reads every file";
-  WriteFile(S("secret.ini"), "secret");
-  WriteFile(S("open.ini"), "open");
-  chmod(S("secret.ini").c_str(), 0);
-  StartRun();
-  manager_->CopyFiles("secret.ini,open.ini", 0);
-  EXPECT_EQ((Entries{"Error: Unable to copy file:  " + S("secret.ini"), "File copied: " + S("open.ini")}),
-            NewLogEntries());
+// Profiles in the top folder and two levels below, data folders beside some of them.
+void LayOutProfiles(const Installations& run) {
+  run.WriteSources({"top.wlp", "top.dat/h", "a/x.wlp", "a/x.dat/h", "a/x.dat/history/2019",
+                    "a/notes.txt", "b/c/y.wlp", "b/c/y.dat/h"});
 }
 
-TEST_F(ToolkitTest, CopyFilesOfTypeCopiesTheTopFolderOnlyAsTheOptionSays) {
-  WriteFile(S("a.ini"), "old a");
-  WriteFile(S("b.ini"), "b");
-  WriteFile(S("sub/c.ini"), "c");
-  WriteFile(D("a.ini"), "new a");
-  StartRun();
-  manager_->CopyFilesOfType("ini", 0);
-  EXPECT_EQ("new a", ReadFile(D("a.ini")));
-  EXPECT_EQ("b", ReadFile(D("b.ini")));
-  EXPECT_FALSE(FileExists(D("sub")));
-  EXPECT_TRUE(NewLogEntries().empty());
+TEST(CopyAllProfilesOfType, CopiesTheTreeKeepsInstalledProfilesAndVisitsTheTopFolderLast) {
+  Installations run;
+  LayOutProfiles(run);
+  run.WriteSources({"a/skip.wlp"});
+  WriteFile(run.Dst("b/c/y.wlp"), "new y");
+  EXPECT_EQ(0, run.manager().CopyAllProfilesOfType("wlp", " A/SKIP.wlp , skip.wlp"));
 
-  EXPECT_EQ(0, manager_->CopyFilesOfType("ini", 1));
-  EXPECT_EQ("old a", ReadFile(D("a.ini")));
+  EXPECT_EQ((Entries{"a", "a/x.dat", "a/x.dat/h", "a/x.wlp", "b", "b/c", "b/c/y.wlp", "top.dat",
+                     "top.dat/h", "top.wlp"}),
+            run.DestinationTree());
+  EXPECT_EQ((Entries{"new y", "a/x.dat/h"}), run.ReadDst({"b/c/y.wlp", "a/x.dat/h"}));
+  EXPECT_EQ((Entries{"File copied:  <src>/a/x.wlp", "Folder copied:  <src>/a/x.dat/*.*",
+                     "File exists - no copy made:  <src>/b/c/y.wlp", "File copied:  <src>/top.wlp",
+                     "Folder copied:  <src>/top.dat/*.*"}),
+            run.RunLog());
 }
 
-TEST_F(ToolkitTest, CopyFilesInRelativeFolderCopiesOneFolderAndLogsIt) {
-  WriteFile(S("templates/a.mss"), "old a");
-  WriteFile(S("templates/b.mss"), "b");
-  WriteFile(S("templates/deeper/c.mss"), "c");
-  WriteFile(D("templates/a.mss"), "new a");
-  StartRun();
-  EXPECT_EQ(1, manager_->CopyFilesInRelativeFolder("nosuch", "mss", 0));
-  EXPECT_EQ(0, manager_->CopyFilesInRelativeFolder("\\templates", "mss", 0));
-  manager_->CopyFilesInRelativeFolder("templates", "none", 0);
-  EXPECT_EQ((Entries{"Files copied from folder:  " + S("templates/*.mss"),
-                     "Files copied from folder:  " + S("templates/*.none")}),
-            NewLogEntries());
-  EXPECT_EQ("old a", ReadFile(D("templates/a.mss")));
-  EXPECT_EQ("b", ReadFile(D("templates/b.mss")));
-  EXPECT_FALSE(FileExists(D("templates/deeper")));
+TEST(CopyProfilesOfTypes, CopiesEveryTypeWithDataFoldersUnlessFTSaysNo) {
+  for (const auto& [option, copiesDataFolders] :
+       {std::make_pair("", true), {"-FT:", true}, {"-FT:yes", true}, {"-FT:N", false},
+        {"-FT:true", false}}) {
+    SCOPED_TRACE(option);
+    Installations run({option});
+    LayOutProfiles(run);
+    EXPECT_EQ(0, run.manager().CopyProfilesOfTypes("txt,wlp", 0xffffffffu));  // option unused
+    EXPECT_TRUE(FileExists(run.Dst("a/notes.txt")) && FileExists(run.Dst("top.wlp")));
+    EXPECT_EQ(copiesDataFolders, FileExists(run.Dst("top.dat/h")));
+    EXPECT_EQ(copiesDataFolders, FileExists(run.Dst("a/x.dat/h")));
+  }
 }
 
-// A pattern copy answers for the whole set; the files that did not arrive are named one by one.
-TEST_F(ToolkitTest, PatternCopiesNameTheFilesThatStayedBehind) {
-  if (RunningAsRoot()) GTEST_SKIP() << "root reads every file";
-  WriteFile(S("templates/a.mss"), "a");
-  WriteFile(S("templates/secret.mss"), "secret");
-  WriteFile(S("top.mss"), "top");
-  WriteFile(S("hidden.mss"), "hidden");
-  WriteFile(D("kept.mss"), "kept");
-  WriteFile(S("kept.mss"), "old kept");
-  chmod(S("templates/secret.mss").c_str(), 0);
-  chmod(S("hidden.mss").c_str(), 0);
-  StartRun();
-  EXPECT_EQ(1, manager_->CopyFilesInRelativeFolder("templates", "mss", 0));
-  EXPECT_EQ(1, manager_->CopyFilesOfType("mss", 0));
-  EXPECT_EQ((Entries{"Files copied from folder:  " + S("templates/*.mss"),
-                     "Error: Unable to copy file:  " + S("templates/secret.mss"),
-                     "Error: Unable to copy file:  " + S("hidden.mss")}),
-            NewLogEntries());
-  EXPECT_EQ("a", ReadFile(D("templates/a.mss")));
-  EXPECT_EQ("top", ReadFile(D("top.mss")));
-  EXPECT_EQ("kept", ReadFile(D("kept.mss")));
-}
-
-// In place, the source is the destination: every operation does nothing, whatever it is given.
-TEST_F(ToolkitTest, InPlaceRunsCopyAndLogNothing) {
-  WriteFile(S("a.ini"), "a");
-  WriteFile(S("sub/b.ini"), "b");
-  StartRun(true);
-  const Entries before = ListTree(src_);
-  const std::vector<std::function<int()>> operations = {
-      [&] { return manager_->CopyFilesOfType("ini", 1); },
-      [&] { return manager_->CopyFilesOfTypes("ini", 1); },
-      [&] { return manager_->CopyFiles("a.ini,sub/b.ini", 0); },
-      [&] { return manager_->CopyAllFilesOfType("ini", vxStringBase::NullStr); },
-      [&] { return manager_->CopyFilesInRelativeFolder("sub", "ini", 0); },
-      [&] { return manager_->CopyFilesInRelativeFolder("nosuch", "ini", 0); },
-  };
-  for (const auto& operation : operations) EXPECT_EQ(0, operation());
-  EXPECT_EQ(before, ListTree(src_));
-  EXPECT_TRUE(NewLogEntries().empty());
-}
-
-TEST_F(ToolkitTest, EmptyListsCopyNothing) {
-  WriteFile(S("a.ini"), "a");
-  StartRun();
-  EXPECT_EQ(0, manager_->CopyFilesOfTypes("", 0));
-  EXPECT_EQ(0, manager_->CopyFilesOfTypes(",", 0));
-  EXPECT_EQ(0, manager_->CopyFiles("", 0));
-  EXPECT_EQ(0, manager_->CopyFiles(" , ", 0));
-  EXPECT_TRUE(NewLogEntries().empty());
-  EXPECT_EQ((Entries{"vxmigrate.log"}), ListTree(dst_));
+// In place the source is the destination: every copying operation answers 0 and leaves it alone,
+// whatever the arguments; nothing is copied, created, rewritten or logged.
+TEST(InPlaceRun, EveryCopyingOperationDoesNothing) {
+  Installations run({}, true);
+  LayOutProfiles(run);
+  const std::string profile = "[Profile]\nLogFilePassword=abc\n";
+  const std::string categories = "[main]\nNumberOfCategories=1\nCategory1=A\n[A]\nProfile1=a.llp\n";
+  for (const char* name : {"p/a.wlp", "l/a.llp", "lang/it.rpl"}) WriteFile(run.Src(name), profile);
+  for (const char* f : {"p/categories.ini", "l/categories.ini"}) WriteFile(run.Src(f), categories);
+  const Entries before = run.DestinationTree();
+  vxMigrationManager& m = run.manager();
+  EXPECT_EQ(std::vector<int>(14, 0),
+            (std::vector<int>{
+                m.CopyFilesOfType("wlp", 1), m.CopyFilesOfTypes("wlp", 1), m.CopyFiles("x", 0),
+                m.CopyAllFilesOfType("wlp", ""), m.CopyFilesInRelativeFolder("a", "wlp", 0),
+                m.CopyFilesInRelativeFolder("nosuch", "wlp", 0), m.CopyProfilesOfTypes("wlp", 0),
+                m.CopyAllProfilesOfType("wlp", ""), m.CopyRenamedUserFiles("p", "*.wlp", "wlp", ""),
+                m.CopyScheduledEventFiles("p", "*.wlp", "wlp", "*"),
+                m.DoCopyLanguageFiles("lang", "new"), m.DoCopyLogProfiles("p", "*.wlp", "wlp", ""),
+                m.DoCopyLinkProfiles("l", "*.llp", "llp", ""),
+                m.DoCopyAlertProfiles("p", "*.wlp", "wlp", "")}));
+  EXPECT_EQ(before, run.DestinationTree());
+  EXPECT_EQ((Entries{profile, categories, categories}),
+            run.ReadDst({"p/a.wlp", "p/categories.ini", "l/categories.ini"}));
+  EXPECT_EQ(Entries{}, run.RunLog());
 }
 
 }  // namespace
