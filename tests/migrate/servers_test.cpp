@@ -1,35 +1,16 @@
 // Running-server detection through real pid files and real processes.
 
 #include <gtest/gtest.h>
-#include <signal.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <string>
 
 #include "migrate/driver_fixture.h"
+#include "support/live_process.h"
 
 namespace vxtest {
 namespace {
-
-// A child that stays alive until the object is destroyed.
-class LiveProcess {
- public:
-  LiveProcess() : pid_(fork()) {
-    if (pid_ == 0) {
-      pause();
-      _exit(0);
-    }
-  }
-  ~LiveProcess() {
-    kill(pid_, SIGKILL);
-    waitpid(pid_, nullptr, 0);
-  }
-  pid_t pid() const { return pid_; }
-
- private:
-  pid_t pid_;
-};
 
 pid_t ExitedProcessPid() {
   pid_t pid = fork();

@@ -2,8 +2,6 @@
 // choice, version ranges, command files, refusals, the install script and the log's exact texts.
 
 #include <gtest/gtest.h>
-#include <signal.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <string>
@@ -11,6 +9,7 @@
 #include <vector>
 
 #include "run/host_fixture.h"
+#include "support/live_process.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -235,15 +234,12 @@ INSTANTIATE_TEST_SUITE_P(
 
 TEST(HostRun, RunningReportingServerRefusesTheRun) {
   HostRun run({"p05_halsuite_obx"});
-  pid_t server = fork();
-  if (server == 0) {
-    pause();
-    _exit(0);
+  HostResult result;
+  {
+    LiveProcess server;
+    WriteFile(run.dst() + "/vxrs.pid", std::to_string(server.pid()) + "\n");
+    result = run.Run(run.RunOptions("halsuite", "obx", "5.5", "3.5"));
   }
-  WriteFile(run.dst() + "/vxrs.pid", std::to_string(server) + "\n");
-  HostResult result = run.Run(run.RunOptions("halsuite", "obx", "5.5", "3.5"));
-  kill(server, SIGKILL);
-  waitpid(server, nullptr, 0);
   EXPECT_EQ(1, result.exitCode);
   std::vector<std::string> body = Body(run);
   ASSERT_EQ(2u, body.size());
