@@ -14,6 +14,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_index.h"
+#include "migrate/internal/profile_migration.h"
 #include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
@@ -170,21 +171,6 @@ void ReportDayTimeFilters(vxMigrationManager* manager, vxMappedINIFile& profile)
                    profile.GetVal(filter, "Name").c_str());
     }
   }
-}
-
-// "/srv/www/index.html" -> base folder "/srv/www", default page "index.html".
-void SplitHomePage(vxMappedINIFile& profile) {
-  const vxStringBase home = profile.GetVal("Profile", "HomePageName");
-  if (home.isEmpty()) return;
-  const unsigned int slash = home.rfind('/');
-  vxStringBase baseDir(home);
-  vxStringBase defaults;
-  if (slash != vxStringBase::BadIndex) {
-    defaults = home.subString(slash + 1, vxStringBase::BadIndex);
-    baseDir = slash == 0 ? vxStringBase() : home.subString(0, slash - 1);
-  }
-  profile.SetVal("Profile", "HomePageDefaults", defaults);
-  profile.SetVal("Profile", "HomePageBaseDir", baseDir);
 }
 
 // Early OBX versions (up to 3.1 and its 'a' releases) read the home page user name in clear.

@@ -73,22 +73,6 @@ void CopyDataFolders(vxMigrationManager& manager, const vxStringBase& folder,
   }
 }
 
-// "a/b/index.htm" gives the folder "a/b" and the page "index.htm"; without a "/" the whole value
-// is the folder and the page is empty.
-void SplitHomePage(vxMappedINIFile& profile) {
-  const vxStringBase homePage = profile.GetVal(kProfileSection, "HomePageName");
-  if (homePage.isEmpty()) return;
-  unsigned int slash = homePage.rfind('/');
-  vxStringBase baseDir(homePage);
-  vxStringBase defaults;
-  if (slash != vxStringBase::BadIndex) {
-    defaults = homePage.subString(slash + 1, homePage.length());
-    baseDir = slash == 0 ? vxStringBase() : homePage.subString(0, slash - 1);
-  }
-  profile.SetVal(kProfileSection, "HomePageDefaults", defaults);
-  profile.SetVal(kProfileSection, "HomePageBaseDir", baseDir);
-}
-
 // Protects the stored credentials. Returns the first key whose value could not be protected, or
 // null when all of them are protected now.
 const char* ProtectCredentials(vxMigrationManager& manager, vxMappedINIFile& profile) {

@@ -77,3 +77,17 @@ bool BothKeepCategories(vxMigrationManager& manager, bool firewallCounts) {
   CategoriesVersion(manager.GetDestinationProductID(), firewallCounts, major, minor);
   return ReachesVersion(manager.GetDestinationVersionDescriptor(), major, minor);
 }
+
+void SplitHomePage(vxMappedINIFile& profile) {
+  const vxStringBase home = profile.GetVal("Profile", "HomePageName");
+  if (home.isEmpty()) return;
+  const unsigned int slash = home.rfind('/');
+  vxStringBase baseDir(home);
+  vxStringBase defaults;
+  if (slash != vxStringBase::BadIndex) {
+    defaults = home.subString(slash + 1, vxStringBase::BadIndex);
+    baseDir = slash == 0 ? vxStringBase() : home.subString(0, slash - 1);
+  }
+  profile.SetVal("Profile", "HomePageDefaults", defaults);
+  profile.SetVal("Profile", "HomePageBaseDir", baseDir);
+}
