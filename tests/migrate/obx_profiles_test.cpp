@@ -1,15 +1,15 @@
 // Profiles of one OBX installation copied into another under "_vxmigrate" names, with their report
-// and database folders when the run carries profile data.
+// and database folders when the run carries profile data; the edition's samples stay behind.
 
 #include <gtest/gtest.h>
 
 #include <cstdio>
-#include <memory>
+#include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
-#include "migrate/driver_fixture.h"
-#include "migrate/manager.h"
+#include "migrate/profiles_fixture.h"
 #include "migrate/sample_lists.h"
 #include "support/test_files.h"
 
@@ -18,72 +18,53 @@ namespace {
 using vxtest::ListTree;
 using vxtest::ReadFile;
 using vxtest::WriteFile;
+using Names = std::vector<std::string>;
 
-class ObxRun {
+// An OBX 3.0 source whose settings name profilesDir, beside an OBX 3.5 destination.
+class ObxRun : public vxtest::Installations {
  public:
-  explicit ObxRun(const std::string& profilesDir, std::vector<std::string> extra = {}) {
-    WriteFile(src() + "/vxm_vxx/vxm_vxx.ini", "[defaults]\nprofilesdir=" + profilesDir + "\n");
-    WriteFile(dst() + "/vxm_vxx/vxm_vxx.ini", "[defaults]\nprofilesdir=\n");
-    std::vector<std::string> args = {root_.Path("bin/vxmigrate"), "-D1:" + src(), "-D2:" + dst(),
-                                      "-P1:obx", "-P2:obx", "-V1:3.0", "-V2:3.5"};
-    args.insert(args.end(), extra.begin(), extra.end());
-    manager_ = vxtest::MakeManager(args);
-    mark_ = vxtest::LogEntries(dst() + "/vxmigrate.log").size();
-  }
-  std::string src() const { return root_.Path("src"); }
-  std::string dst() const { return root_.Path("dst"); }
-  vxMigrationManager* manager() { return manager_.get(); }
-  std::vector<std::string> NewLog() {
-    std::vector<std::string> all = vxtest::LogEntries(dst() + "/vxmigrate.log");
-    return std::vector<std::string>(all.begin() + mark_, all.end());
+  explicit ObxRun(const std::string& profilesDir, const Names& extra = {}, bool inPlace = false)
+      : Installations({"obx", "obx", "3.0", "3.5", extra, inPlace}) {
+    WriteFile(Dst("vxm_vxx/vxm_vxx.ini"), "[defaults]\nprofilesdir=\n");
+    WriteFile(Src("vxm_vxx/vxm_vxx.ini"), "[defaults]\nprofilesdir=" + profilesDir + "\n");
   }
 
   // Two profiles of the user's (one with report and database folders) and the edition's samples.
   void WriteProfiles() {
-    const std::string folder = src() + "/vxm_vxx/datfiles/profiles/";
-    WriteFile(folder + "shop.wlp", "[profile]\nName=Shop\n");
-    WriteFile(folder + "intranet.wlp", "[profile]\nondemandreports=1\n");
-    std::string samples = std::string(GetSampleFileList("obx", "wlp")) + ",";
-    for (size_t comma; (comma = samples.find(',')) != std::string::npos;) {
-      WriteFile(folder + samples.substr(0, comma), "[profile]\n");
-      samples.erase(0, comma + 1);
+    WriteFile(Src("vxm_vxx/datfiles/profiles/shop.wlp"), "[profile]\nName=Shop\n");
+    WriteFile(Src("vxm_vxx/datfiles/profiles/intranet.wlp"), "[profile]\nondemandreports=1\n");
+    std::istringstream samples(GetSampleFileList("obx", "wlp"));
+    for (std::string name; std::getline(samples, name, ',');) {
+      WriteFile(Src("vxm_vxx/datfiles/profiles/" + name), "[profile]\n");
     }
-    WriteFile(src() + "/vxm_vxx/datfiles/reports/shop.wlp/index.htm", "<html/>");
-    WriteFile(src() + "/vxm_vxx/datfiles/databases/shop/visits.db", "data");
+    WriteFile(Src("vxm_vxx/datfiles/reports/shop.wlp/index.htm"), "<html/>");
+    WriteFile(Src("vxm_vxx/datfiles/databases/shop/visits.db"), "data");
   }
-
- private:
-  vxtest::TempDir root_;
-  std::unique_ptr<vxMigrationManager> manager_;
-  size_t mark_ = 0;
 };
 
+// A profile travelling without its folders makes its reports on demand unless it says otherwise.
 class ObxProfilesFT : public testing::TestWithParam<const char*> {};
 
 TEST_P(ObxProfilesFT, CopiesDataFoldersOnlyWhenAsked) {
   const std::string ft = GetParam();
-  ObxRun run("", ft.empty() ? std::vector<std::string>{} : std::vector<std::string>{"-FT:" + ft});
+  ObxRun run("", ft.empty() ? Names{} : Names{"-FT:" + ft});
   run.WriteProfiles();
-  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 0);
-  const std::string to = run.dst() + "/vxm_vxx/datfiles/";
+  EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 0);
   const bool data = ft != "N";
-  std::vector<std::string> log;
+  const std::string to = run.Dst("vxm_vxx/datfiles/");
+  Names log;
   for (const char* name : {"intranet", "shop"}) {
     log.push_back("Profile copied: " + to + "profiles/" + name + "_vxmigrate.wlp");
     if (!data) continue;
     log.push_back("Report folder copied: " + to + "reports/" + name + "_vxmigrate.wlp");
     log.push_back("Database folder copied: " + to + "databases/" + name + "_vxmigrate");
   }
-  EXPECT_EQ(run.NewLog(), log);
-  std::vector<std::string> tree = {"profiles", "profiles/intranet_vxmigrate.wlp",
-                                   "profiles/shop_vxmigrate.wlp"};
-  if (data) {
-    tree = {"databases", "databases/shop_vxmigrate", "databases/shop_vxmigrate/visits.db",
-            tree[0], tree[1], tree[2], "reports", "reports/shop_vxmigrate.wlp",
-            "reports/shop_vxmigrate.wlp/index.htm"};
-  }
-  EXPECT_EQ(ListTree(to), tree);
-  // A profile travelling without its folders makes its reports on demand unless it said otherwise.
+  EXPECT_EQ(run.RunLog(), log);
+  const Names tree = {"databases", "databases/shop_vxmigrate", "databases/shop_vxmigrate/visits.db",
+                      "profiles", "profiles/intranet_vxmigrate.wlp",
+                      "profiles/shop_vxmigrate.wlp", "reports", "reports/shop_vxmigrate.wlp",
+                      "reports/shop_vxmigrate.wlp/index.htm"};
+  EXPECT_EQ(ListTree(to), data ? tree : Names(tree.begin() + 3, tree.begin() + 6));
   EXPECT_EQ(ReadFile(to + "profiles/shop_vxmigrate.wlp"),
             data ? "[profile]\nName=Shop\n" : "[profile]\nName=Shop\nondemandreports=0\n");
   EXPECT_EQ(ReadFile(to + "profiles/intranet_vxmigrate.wlp"), "[profile]\nondemandreports=1\n");
@@ -91,52 +72,45 @@ TEST_P(ObxProfilesFT, CopiesDataFoldersOnlyWhenAsked) {
 
 INSTANTIATE_TEST_SUITE_P(Values, ObxProfilesFT, testing::Values("", "Y", "yes", "N"));
 
-struct FolderCase {
-  const char* profilesDir;
-  const char* folder;  // where the source's profiles are; "" when the value is refused
-};
-
-class ObxProfilesFolder : public testing::TestWithParam<FolderCase> {};
+// The source's profile folder must lie inside its installation ("" when the value is refused).
+class ObxProfilesFolder : public testing::TestWithParam<std::pair<const char*, std::string>> {};
 
 TEST_P(ObxProfilesFolder, AcceptsOnlyFoldersInsideTheInstallation) {
-  ObxRun run(GetParam().profilesDir, {"-FT:N"});
-  const std::string folder = *GetParam().folder ? GetParam().folder : "profiles";
-  WriteFile(run.src() + "/" + folder + "/p.wlp", "[profile]\nondemandreports=1\n");
-  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 0);
-  EXPECT_EQ(ListTree(run.dst() + "/vxm_vxx/datfiles/profiles"),
-            *GetParam().folder ? std::vector<std::string>{"p_vxmigrate.wlp"}
-                               : std::vector<std::string>{});
+  const auto& [profilesDir, folder] = GetParam();
+  ObxRun run(profilesDir, {"-FT:N"});
+  WriteFile(run.Src((folder.empty() ? "profiles" : folder) + "/p.wlp"), "[profile]\n");
+  EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 0);
+  EXPECT_EQ(ListTree(run.Dst("vxm_vxx/datfiles/profiles")),
+            folder.empty() ? Names{} : Names{"p_vxmigrate.wlp"});
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Cases, ObxProfilesFolder,
-    testing::Values(FolderCase{"", "vxm_vxx/datfiles/profiles"}, FolderCase{"./profiles", "profiles"},
-                    FolderCase{".x\\profiles", ".x/profiles"}, FolderCase{"ab", "ab"},
-                    FolderCase{".\\profiles", ""}, FolderCase{"/data/profiles", ""},
-                    FolderCase{"../profiles", ""}));
+INSTANTIATE_TEST_SUITE_P(Cases, ObxProfilesFolder, testing::Values(
+    std::pair("", "vxm_vxx/datfiles/profiles"), std::pair("./profiles", "profiles"),
+    std::pair(".x\\profiles", ".x/profiles"), std::pair("ab", "ab"), std::pair(".\\profiles", ""),
+    std::pair("/data/profiles", ""), std::pair("../profiles", "")));
 
-// A copy already there is the user's: it is neither redone nor logged. Without either settings
-// file nothing is copied, nor in place.
+// A copy already there is the user's: it is neither redone nor logged. Nothing is copied in place,
+// nor without either settings file.
 TEST(ObxProfiles, LeavesExistingCopiesAndRefusesWithoutSettings) {
   ObxRun run("");
   run.WriteProfiles();
-  const std::string mine = run.dst() + "/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp";
+  const std::string mine = run.Dst("vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp");
   WriteFile(mine, "mine");
-  run.manager()->DoCopyOBXProfiles();
+  run.manager().DoCopyOBXProfiles();
   EXPECT_EQ(ReadFile(mine), "mine");
-  EXPECT_EQ(run.NewLog().size(), 3u);  // the intranet profile and its two folders
+  EXPECT_EQ(run.RunLog().size(), 3u);  // the intranet profile and its two folders
 
-  auto inPlace = vxtest::MakeManager({run.src() + "/vxmigrate", "-D1:" + run.src(),
-                                      "-D2:" + run.src(), "-P1:obx", "-P2:obx", "-V1:3.0",
-                                      "-V2:3.5"});
-  const std::vector<std::string> before = ListTree(run.src());
-  EXPECT_EQ(inPlace->DoCopyOBXProfiles(), 0);
-  EXPECT_EQ(ListTree(run.src()), before);
+  ObxRun inPlace("", {}, true);
+  inPlace.WriteProfiles();
+  inPlace.manager();
+  const Names before = ListTree(inPlace.Src());
+  EXPECT_EQ(inPlace.manager().DoCopyOBXProfiles(), 0);
+  EXPECT_EQ(ListTree(inPlace.Src()), before);
 
-  std::remove((run.src() + "/vxm_vxx/vxm_vxx.ini").c_str());
-  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 1);
-  std::remove((run.dst() + "/vxm_vxx/vxm_vxx.ini").c_str());
-  EXPECT_EQ(run.manager()->DoCopyOBXProfiles(), 1);
+  std::remove(run.Src("vxm_vxx/vxm_vxx.ini").c_str());
+  EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 1);
+  std::remove(run.Dst("vxm_vxx/vxm_vxx.ini").c_str());
+  EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 1);
 }
 
 }  // namespace
