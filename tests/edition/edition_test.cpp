@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "edition/halden_to_obx.h"
-#include "migrate/profiles_fixture.h"
+#include "migrate/installations_fixture.h"
 #include "support/test_files.h"
 
 namespace {
@@ -55,7 +55,7 @@ class Conversion : public vxtest::Installations {
   explicit Conversion(const std::string& data, const std::string& version = "3.0",
                       const std::vector<std::string>& extra = {},
                       const std::string& product = "halsuite")
-      : Installations({product, "obx", "5.5", version, extra}) {
+      : Installations(vxtest::RunArgs(product, "obx", "5.5", version, extra)) {
     for (const auto& [name, text] : Data(data + "/halden")) WriteFile(Src(name), text);
     for (const auto& [name, text] : Data(data + "/obx")) WriteFile(Dst(name), text);
   }
@@ -68,11 +68,6 @@ class Conversion : public vxtest::Installations {
     std::string text;
     for (size_t i = mark_; i < entries.size(); ++i) text += entries[i] + "\n";
     mark_ = entries.size();
-    for (const auto& [folder, mark] : {std::pair(Src(), "<src>"), std::pair(Dst(), "<dst>")}) {
-      for (size_t at; (at = text.find(folder)) != std::string::npos;) {
-        text.replace(at, folder.size(), mark);
-      }
-    }
     return text;
   }
 

@@ -106,6 +106,15 @@ class Installations {
   size_t headerEntries_ = 0;
 };
 
+// The options of a run from product p1 at version v1 to p2 at v2, then extra; they take the place of
+// an Installations' defaults.
+inline Entries RunArgs(const std::string& p1, const std::string& p2, const std::string& v1,
+                       const std::string& v2, const Entries& extra = {}) {
+  Entries args = {"-P1:" + p1, "-P2:" + p2, "-V1:" + v1, "-V2:" + v2};
+  args.insert(args.end(), extra.begin(), extra.end());
+  return args;
+}
+
 inline unsigned int ModeOf(const std::string& path) {
   struct stat st = {};
   return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
@@ -125,6 +134,14 @@ inline std::string Decrypted(std::string stored) {
   const int read = VXUI_Decrypt(&stored[0], clear.data(), &length, &notProtected);
   if (read != 1 || notProtected != 0) return "<not protected>";
   return std::string(clear.begin(), clear.begin() + static_cast<long>(length));
+}
+
+// The protected form of a clear text.
+inline std::string Protected(const std::string& clear) {
+  std::vector<unsigned char> data(clear.begin(), clear.end());
+  std::vector<char> output(5 + 32 * (clear.size() / 16 + 2));
+  if (VXUI_Encrypt(data.data(), data.size(), output.data()) != 1) return "<unprotectable>";
+  return std::string(output.data());
 }
 
 }  // namespace vxtest

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include "migrate/profiles_fixture.h"
+#include "migrate/installations_fixture.h"
 #include "migrate/sample_lists.h"
 #include "support/test_files.h"
 
@@ -24,7 +24,7 @@ using Names = std::vector<std::string>;
 class ObxRun : public vxtest::Installations {
  public:
   explicit ObxRun(const std::string& profilesDir, const Names& extra = {}, bool inPlace = false)
-      : Installations({"obx", "obx", "3.0", "3.5", extra, inPlace}) {
+      : Installations(vxtest::RunArgs("obx", "obx", "3.0", "3.5", extra), inPlace) {
     WriteFile(Dst("vxm_vxx/vxm_vxx.ini"), "[defaults]\nprofilesdir=\n");
     WriteFile(Src("vxm_vxx/vxm_vxx.ini"), "[defaults]\nprofilesdir=" + profilesDir + "\n");
   }
@@ -52,12 +52,13 @@ TEST_P(ObxProfilesFT, CopiesDataFoldersOnlyWhenAsked) {
   EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 0);
   const bool data = ft != "N";
   const std::string to = run.Dst("vxm_vxx/datfiles/");
+  const std::string logged = "<dst>/vxm_vxx/datfiles/";  // as RunLog writes the folder
   Names log;
   for (const char* name : {"intranet", "shop"}) {
-    log.push_back("Profile copied: " + to + "profiles/" + name + "_vxmigrate.wlp");
+    log.push_back("Profile copied: " + logged + "profiles/" + name + "_vxmigrate.wlp");
     if (!data) continue;
-    log.push_back("Report folder copied: " + to + "reports/" + name + "_vxmigrate.wlp");
-    log.push_back("Database folder copied: " + to + "databases/" + name + "_vxmigrate");
+    log.push_back("Report folder copied: " + logged + "reports/" + name + "_vxmigrate.wlp");
+    log.push_back("Database folder copied: " + logged + "databases/" + name + "_vxmigrate");
   }
   EXPECT_EQ(run.RunLog(), log);
   const Names tree = {"databases", "databases/shop_vxmigrate", "databases/shop_vxmigrate/visits.db",
