@@ -53,16 +53,15 @@ bool KeptAsNewer(const vxStringBase& source, const vxStringBase& destination) {
          (from.st_mtim.tv_sec == to.st_mtim.tv_sec && from.st_mtim.tv_nsec <= to.st_mtim.tv_nsec);
 }
 
-// The next non-empty piece of a list, blanks around it dropped: "ini, dat," names ini and dat.
-bool NextListItem(vxBStringTokenizer& tokens, vxStringBase& item) {
+}  // namespace
+
+bool vxNextListItem(vxBStringTokenizer& tokens, vxStringBase& item) {
   while (tokens.GetNext(item)) {
     item.stripWhite(vxStringBase::kBoth);
     if (!item.isEmpty()) return true;
   }
   return false;
 }
-
-}  // namespace
 
 std::vector<vxStringBase> vxListSourceFolders(vxMigrationManager& manager) {
   std::vector<vxStringBase> folders;
@@ -101,7 +100,7 @@ int vxMigrationManager::CopyFilesOfTypes(const vxStringBase& extensions, unsigne
   if (IsInPlaceMigrate()) return 0;
   vxBStringTokenizer tokens(extensions, ",", true);
   vxStringBase extension;
-  while (NextListItem(tokens, extension)) CopyAllFilesOfType(extension, vxStringBase::NullStr);
+  while (vxNextListItem(tokens, extension)) CopyAllFilesOfType(extension, vxStringBase::NullStr);
   return 0;
 }
 
@@ -113,7 +112,7 @@ int vxMigrationManager::CopyFiles(const vxStringBase& fileNames, unsigned int co
   vxStringBase name;
   vxStringBase source;
   vxStringBase destination;
-  while (NextListItem(tokens, name)) {
+  while (vxNextListItem(tokens, name)) {
     vxFileManager::MakePath(source, m_sourceDirectory, vxStringBase::NullStr, name);
     vxFileManager::MakePath(destination, m_destinationDirectory, vxStringBase::NullStr, name);
     if (vxFileManager::CopyFile(source, destination, 0, 1, copyOption, 0, 0, nullptr, nullptr) == 0) {

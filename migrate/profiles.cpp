@@ -11,6 +11,7 @@
 #include "foundation/files/filename.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_index.h"
+#include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -39,7 +40,7 @@ int vxMigrationManager::CopyProfilesOfTypes(const vxStringBase& extensions, unsi
   if (IsInPlaceMigrate()) return 0;
   vxBStringTokenizer tokens(extensions, ",", true);
   vxStringBase extension;
-  while (tokens.GetNext(extension) != 0) {
+  while (vxNextListItem(tokens, extension)) {
     CopyAllProfilesOfType(extension, vxStringBase::NullStr);
   }
   return 0;

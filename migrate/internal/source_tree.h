@@ -9,6 +9,7 @@
 
 #include "foundation/files/file_info.h"
 #include "foundation/string/string_base.h"
+#include "foundation/string/tokenizer.h"
 
 class vxMigrationManager;
 
@@ -21,6 +22,10 @@ std::vector<vxStringBase> vxListSourceFolders(vxMigrationManager& manager);
 // logged). folderPath receives the folder's full path.
 bool vxListSourceFiles(vxMigrationManager& manager, const vxStringBase& folder, const char* pattern,
                        vxStringBase& folderPath, vxFileInfoList& files);
+
+// The next non-empty piece of a list of types or names, blanks around it dropped: "ini, dat,"
+// names ini and dat. False at the end of the list.
+bool vxNextListItem(vxBStringTokenizer& tokens, vxStringBase& item);
 
 // The log line of a file that could not be copied; shared so every copy reports it alike.
 extern const char vxMsgUnableToCopyFile[];

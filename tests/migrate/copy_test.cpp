@@ -212,7 +212,7 @@ TEST(CopyProfilesOfTypes, CopiesEveryTypeWithDataFoldersUnlessFTSaysNo) {
     SCOPED_TRACE(option);
     Installations run({option});
     LayOutProfiles(run);
-    EXPECT_EQ(0, run.manager().CopyProfilesOfTypes("txt,wlp", 0xffffffffu));  // option unused
+    EXPECT_EQ(0, run.manager().CopyProfilesOfTypes("txt, wlp,", 0xffffffffu));  // option unused
     EXPECT_TRUE(FileExists(run.Dst("a/notes.txt")) && FileExists(run.Dst("top.wlp")));
     EXPECT_EQ(copiesDataFolders, FileExists(run.Dst("top.dat/h")));
     EXPECT_EQ(copiesDataFolders, FileExists(run.Dst("a/x.dat/h")));
