@@ -116,6 +116,14 @@ int HaldenToOBXHelper::DoMergeAdvancedOptionsFiles() {
       const vxStringBase& id = source.GetVal(lines, "ProfileID");
       if (knownIds.count(vxFoldCase(id.view())) != 0) continue;
 
+      // A section at or above the count (a count lowered by hand) is one of the destination's own
+      // profiles: it is never mixed with an added one, and the added profile takes the next number.
+      while (destination.HasSection(vxStringBase(NumberedName("QueryProfile", next)))) {
+        knownIds.insert(vxFoldCase(
+            destination.GetVal(vxStringBase(NumberedName("QueryProfile", next)), "ProfileID")
+                .view()));
+        ++next;
+      }
       const std::string section = NumberedName("QueryProfile", next);
       destination.AddMapSection(section.c_str(), lines);
       destination.SetVal(vxStringBase(section), "Page", url);

@@ -201,6 +201,7 @@ TEST_P(EditionPages, TakeTheDestinationsLayout) {
 
 INSTANTIATE_TEST_SUITE_P(Cases, EditionPages,
                          testing::Values(std::tuple("pages_v2", "2.5", 0),
+                                         std::tuple("pages_v2_taken", "2.5", 0),
                                          std::tuple("pages_v3", "3.0", 0),
                                          std::tuple("pages_missing", "2.0", 1),
                                          std::tuple("pages_missing", "3.0", 1)));
