@@ -57,10 +57,11 @@ int vxMigrationManager::DoCheckMigrateValidity() {
     return 1;
   }
   // A destination that continues the source text with a separator lies inside it. Found at
-  // position 0 or 1 (a leading separator of either spelling), both count.
+  // position 0 or 1 (a leading separator of either spelling), both count. The same text on both
+  // sides is an in-place run, also when it ends in a separator.
   vxStringBase source = WithoutTrailingSeparators(m_sourceDirectory);
   unsigned int position = m_destinationDirectory.find(source, 0, true);
-  if (position < 2) {
+  if (position < 2 && !IsInPlaceMigrate()) {
     unsigned int after = position + source.length();
     if (m_destinationDirectory.find('\\', after) != vxStringBase::BadIndex ||
         m_destinationDirectory.find('/', after) != vxStringBase::BadIndex) {

@@ -38,21 +38,21 @@ const ServerRow kServers[] = {
 };
 
 // 1 (and the server's message in the log) when the pid file of that server names a live process.
-// Products without servers look at the bare folder, which never reads as a pid.
+// Products without servers have no pid file and never count as running, even when the
+// installation "folder" given is really a file that happens to read as a pid.
 int CheckServerRunning(vxMigrationManager& manager, ServerKind kind, int productID,
                        const vxVersionDescriptor& version, const vxStringBase& folder) {
   const ServerRow* row = nullptr;
   for (const ServerRow& candidate : kServers) {
     if (candidate.productID == productID && candidate.kind == kind) row = &candidate;
   }
-  const char* pidFile = "";
-  if (row != nullptr) {
-    pidFile = version < vxVersionDescriptor("3.1") ? row->pidFileBefore31 : row->pidFileFrom31;
-  }
+  if (row == nullptr) return 0;
+  const char* pidFile =
+      version < vxVersionDescriptor("3.1") ? row->pidFileBefore31 : row->pidFileFrom31;
   vxStringBase path;
   vxFileManager::MakePath(path, folder, pidFile, 1);
   if (!manager.sendNullSignal(manager.readPid(path.c_str()))) return 0;
-  manager.Log(row != nullptr ? row->message : "");
+  manager.Log(row->message);
   return 1;
 }
 

@@ -5,13 +5,19 @@
 
 #include <dlfcn.h>
 
+#include <cstring>
+#include <string>
+
 vxSharedLib::vxSharedLib(const char* path) {
   if (path == nullptr || *path == '\0') {
     error_ = "no library named";
     return;
   }
+  // A bare name is a file in the current folder, as in a listing of it; the loader would
+  // otherwise search its system folders and load some other library of that name.
+  std::string file = strchr(path, '/') != nullptr ? path : std::string("./") + path;
   dlerror();
-  handle_ = dlopen(path, RTLD_NOW | RTLD_LOCAL);
+  handle_ = dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
   if (handle_ == nullptr) {
     const char* why = dlerror();
     error_ = why != nullptr ? why : "unknown loader error";

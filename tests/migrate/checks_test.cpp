@@ -93,6 +93,7 @@ TEST_P(ChildFolderCheck, RefusesADestinationBelowTheSource) {
 
 INSTANTIATE_TEST_SUITE_P(Cases, ChildFolderCheck,
                          ::testing::Values(FolderCase{"a", "a", false},
+                                           FolderCase{"a/", "a/", false},
                                            FolderCase{"a", "a/new", true},
                                            FolderCase{"a/", "a/new", true},
                                            FolderCase{"a", "ab/new", true},

@@ -94,6 +94,14 @@ TEST(ServerChecks, PidFileNamesFollowProductAndVersion) {
   WriteFile(root.Path("dst/vxinterface.pid"), pid);
   EXPECT_EQ(1, manager->CheckInterfaceRunning(21, v30, 0));
   EXPECT_EQ(0, manager->CheckEngineRunning(1, v30, 0));  // products without servers
+
+  // A source "folder" that is really a file holding a live pid is still no server.
+  WriteFile(root.Path("srcfile"), pid);
+  auto fileSource = MakeManager({root.Path("bin/vxmigrate"), "-D1:" + root.Path("srcfile"),
+                                 "-D2:" + root.Path("dst"), "-P1:pavsuite", "-P2:pavsuite",
+                                 "-V1:5.0", "-V2:5.5"});
+  EXPECT_EQ(0, fileSource->CheckEngineRunning(1, v30, 1));
+  EXPECT_EQ(0, fileSource->CheckInterfaceRunning(1, v30, 1));
 }
 
 TEST(ServerChecks, TheRunChecksDestinationEngineFirst) {

@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "foundation/files/shared_lib.h"
 #include "run/host_fixture.h"
 #include "support/live_process.h"
 #include "support/test_files.h"
@@ -116,6 +117,18 @@ TEST(HostRun, SomethingThatIsNotASharedObjectIsSkipped) {
   HostResult result = run.Run(run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5"));
   EXPECT_EQ(0, result.exitCode) << result.err;
   EXPECT_EQ("p10", ReadFile(run.dst() + "/plugin_calls.txt").substr(0, 3));
+}
+
+// With no executable found, the current folder's listing gives bare names; they load from there.
+TEST(HostRun, PluginNamedWithoutAFolderLoadsFromTheCurrentFolder) {
+  char previous[4096];
+  ASSERT_NE(nullptr, getcwd(previous, sizeof previous));
+  ASSERT_EQ(0, chdir(VXM_TEST_PLUGIN_DIR));
+  {
+    vxSharedLib library("p10_pavsuite.so");
+    EXPECT_NE(nullptr, library.ProcAddr("MigrateInitialize")) << library.LoadError().str();
+  }
+  ASSERT_EQ(0, chdir(previous));
 }
 
 TEST(HostRun, IncompleteCommandLinePrintsUsageAndWritesNoLog) {
