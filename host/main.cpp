@@ -34,8 +34,12 @@ int main(int argc, char** argv) {
     return 1;
   }
   int result = manager.DoMigration();
-  if (manager.GetLog() != nullptr) {
-    printf("VXMigrate log: %s\n", manager.GetLog()->GetFilename().c_str());
+  const vxLogFile* log = manager.GetLog();
+  if (log->IsOpen()) {
+    printf("VXMigrate log: %s\n", log->GetFilename().c_str());
+  } else {
+    // Typically a destination folder that does not exist: the log has nowhere to go.
+    fprintf(stderr, "vxmigrate: cannot write the log %s\n", log->GetFilename().c_str());
   }
   return result;
 }

@@ -1,6 +1,7 @@
 // Product identity and the checks that decide whether a run may start and whether a plug-in
 // accepts the run's versions ("vxmigrate.ini" beside the executable).
 
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "foundation/files/file_manager.h"
@@ -131,8 +132,17 @@ bool vxMigrationManager::IsInlineMigrate() const {
          m_sourceVersionDescriptor->IsInline(*m_destinationVersionDescriptor);
 }
 
+// Equal texts, or two spellings of one existing folder ("/opt/a" and "/opt/a/", or a link to it):
+// copying a folder onto itself must never be taken for a side-by-side run, whose rewrites of the
+// destination would then change the source.
 bool vxMigrationManager::IsInPlaceMigrate() const {
-  return m_sourceDirectory.equals(m_destinationDirectory, true);
+  if (m_sourceDirectory.equals(m_destinationDirectory, true)) return true;
+  struct stat source;
+  struct stat destination;
+  return !m_sourceDirectory.isEmpty() && !m_destinationDirectory.isEmpty() &&
+         stat(m_sourceDirectory.c_str(), &source) == 0 &&
+         stat(m_destinationDirectory.c_str(), &destination) == 0 && S_ISDIR(source.st_mode) &&
+         source.st_dev == destination.st_dev && source.st_ino == destination.st_ino;
 }
 
 vxStringBase vxMigrationManager::GetFullSourceFilename(const char* name) const {

@@ -75,7 +75,8 @@ int vxMigrationManager::CheckInterfaceRunning(int productID, const vxVersionDesc
 // a damaged pid file errs on the side of not migrating under a live server.
 int vxMigrationManager::readPid(const char* path) {
   int pid = -1;
-  int fd = open(path, O_RDONLY | O_CLOEXEC);
+  // Never blocks on a pipe put where the pid file should be; it then reads as empty.
+  int fd = open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK);
   if (fd == 0) {
     close(fd);
     return pid;

@@ -4,6 +4,7 @@
 #include "foundation/files/log_file.h"
 
 #include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -27,7 +28,11 @@ std::string TimeStamp() {
 
 vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
   int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
-  fd_ = open(filename_.c_str(), flags, 0644);
+  // A link where the log belongs is removed, never followed: it could point into the source
+  // installation, which the run must not change.
+  struct stat st;
+  if (lstat(filename_.c_str(), &st) == 0 && S_ISLNK(st.st_mode)) unlink(filename_.c_str());
+  fd_ = open(filename_.c_str(), flags | O_NOFOLLOW, 0644);
 }
 
 vxLogFile::~vxLogFile() {

@@ -94,6 +94,7 @@ TEST_P(ChildFolderCheck, RefusesADestinationBelowTheSource) {
 INSTANTIATE_TEST_SUITE_P(Cases, ChildFolderCheck,
                          ::testing::Values(FolderCase{"a", "a", false},
                                            FolderCase{"a/", "a/", false},
+                                           FolderCase{"a/", "a", false},
                                            FolderCase{"a", "a/new", true},
                                            FolderCase{"a/", "a/new", true},
                                            FolderCase{"a", "ab/new", true},
@@ -153,6 +154,14 @@ TEST(RunQuestions, InPlaceAndInline) {
             inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
   auto sideBySide = MakeRun(root, "log", "log", "5.5", "6.0");  // another major number
   EXPECT_FALSE(sideBySide->IsInPlaceMigrate() || sideBySide->IsInlineMigrate());
+  // Two spellings of one folder are one installation: nothing may be copied onto itself.
+  ASSERT_EQ(0, symlink(root.Path("same").c_str(), root.Path("alias").c_str()));
+  for (const std::string& other : {root.Path("same/"), root.Path("alias")}) {
+    auto spelt = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + other, "-P1:log",
+                              "-P2:log", "-V1:6.0", "-V2:6.5"});
+    EXPECT_TRUE(spelt->IsInPlaceMigrate()) << other;
+    EXPECT_EQ(0, spelt->DoCheckMigrateValidity()) << other;
+  }
 }
 
 TEST(Executable, IsFoundFromTheProgramNameAsAShellWould) {

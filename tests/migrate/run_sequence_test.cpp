@@ -27,5 +27,18 @@ TEST(RunSequence, InstallScriptRunsInTheDestinationAndTheFolderComesBack) {
   EXPECT_EQ(root.Path("dst") + "\n", ReadFile(root.Path("dst/ran_in.txt")));
 }
 
+TEST(RunSequence, ALinkInPlaceOfTheLogIsReplacedNotFollowed) {
+  TempDir root;
+  WriteFile(root.Path("src/keep.txt"), "customer data\n");
+  MakeDirs(root.Path("dst"));
+  ASSERT_EQ(0, symlink(root.Path("src/keep.txt").c_str(), root.Path("dst/vxmigrate.log").c_str()));
+  auto manager = MakeRun(root, "log", "log", "6.0", "6.5");
+  EXPECT_EQ("customer data\n", ReadFile(root.Path("src/keep.txt")));
+  struct stat st;
+  ASSERT_EQ(0, lstat(root.Path("dst/vxmigrate.log").c_str(), &st));
+  EXPECT_TRUE(S_ISREG(st.st_mode));
+  EXPECT_EQ(11u, LogEntries(root.Path("dst/vxmigrate.log")).size());  // the header
+}
+
 }  // namespace
 }  // namespace vxtest

@@ -245,6 +245,15 @@ INSTANTIATE_TEST_SUITE_P(
                 "Error: Cannot migrate because source version greater than destination version"}),
     [](const ::testing::TestParamInfo<Refusal>& info) { return info.param.name; });
 
+TEST(HostRun, MissingDestinationIsReportedOnStandardError) {
+  HostRun run({"p10_pavsuite"});
+  std::vector<std::string> options = run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5");
+  options[1] = "-D2:" + run.Path("nowhere");
+  HostResult result = run.Run(options);
+  EXPECT_EQ(1, result.exitCode);
+  EXPECT_EQ("vxmigrate: cannot write the log " + run.Path("nowhere") + "/vxmigrate.log\n", result.err);
+}
+
 TEST(HostRun, RunningReportingServerRefusesTheRun) {
   HostRun run({"p05_halsuite_obx"});
   HostResult result;
