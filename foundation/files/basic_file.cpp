@@ -78,13 +78,23 @@ int vxBasicFile::Open() {
     fd_ = OpenRewrite(name_, flags, permissions, tempName_);
     return fd_ >= 0 ? 0 : 1;
   }
-  fd_ = open(name_.c_str(), flags, permissions);
+  // Non-blocking until it is known to be a regular file: opening a pipe for reading would wait
+  // for a writer, and reading a pipe or a device might never end.
+  fd_ = open(name_.c_str(), flags | O_NONBLOCK, permissions);
   if (fd_ < 0 && access == O_RDWR && !(flags & O_CREAT) && (errno == EACCES || errno == EROFS)) {
     // A file we may read but not write (a read-only source installation) can still be read;
     // a Write then fails.
-    fd_ = open(name_.c_str(), (flags & ~O_ACCMODE) | O_RDONLY);
+    fd_ = open(name_.c_str(), (flags & ~O_ACCMODE) | O_RDONLY | O_NONBLOCK);
   }
-  return fd_ >= 0 ? 0 : 1;
+  if (fd_ < 0) return 1;
+  struct stat st;
+  if (fstat(fd_, &st) != 0 || !S_ISREG(st.st_mode)) {
+    close(fd_);
+    fd_ = -1;
+    return 1;
+  }
+  fcntl(fd_, F_SETFL, fcntl(fd_, F_GETFL) & ~O_NONBLOCK);
+  return 0;
 }
 
 int vxBasicFile::ReadAll(vxStringBase& text) {
@@ -98,20 +108,27 @@ int vxBasicFile::ReadAll(vxStringBase& text) {
       static_cast<unsigned long long>(st.st_size) < (1ULL << 30)) {
     expected = static_cast<size_t>(st.st_size);
   }
-  std::string content(expected + 1 > kReadChunk ? expected + 1 : kReadChunk, '\0');
-  size_t used = 0;
-  for (;;) {
-    if (used == content.size()) content.resize(content.size() * 2);
-    ssize_t n = read(fd_, &content[used], content.size() - used);
-    if (n == 0) break;
-    if (n < 0) {
-      if (errno == EINTR) continue;
-      return 1;
+  try {  // a file larger than memory (or than a 32-bit address space) is refused, not thrown
+    std::string content(expected + 1 > kReadChunk ? expected + 1 : kReadChunk, '\0');
+    size_t used = 0;
+    for (;;) {
+      if (used == content.size()) {
+        if (content.size() > content.max_size() / 2) return 1;
+        content.resize(content.size() * 2);
+      }
+      ssize_t n = read(fd_, &content[used], content.size() - used);
+      if (n == 0) break;
+      if (n < 0) {
+        if (errno == EINTR) continue;
+        return 1;
+      }
+      used += static_cast<size_t>(n);
     }
-    used += static_cast<size_t>(n);
+    content.resize(used);
+    text = vxStringBase(std::string_view(content));
+  } catch (...) {
+    return 1;
   }
-  content.resize(used);
-  text = vxStringBase(std::string_view(content));
   return 0;
 }
 

@@ -16,8 +16,8 @@ namespace vxini {
 // file (a folder, a device, a pipe), or too large for the model's 32-bit offsets.
 bool ReadWholeFile(const std::string& path, std::string* text);
 
-// Where a replacement goes and how it looks: a symbolic link is followed, so that the file it
-// names is replaced and the link stays.
+// Where a replacement goes and how it looks: a symbolic link is itself replaced by the new file,
+// never written through; the new file takes the mode of what the link pointed to.
 struct ReplaceTarget {
   std::string path;
   bool exists = false;

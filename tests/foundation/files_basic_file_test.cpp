@@ -63,4 +63,29 @@ TEST(BasicFile, ReadOnlyFileIsReadWholeButNeverRewritten) {
   }
 }
 
+// What is not a regular file is refused at Open: a pipe would make the open or the read wait for a
+// writer forever, and a device such as /dev/zero would never end.
+struct SpecialFile {
+  const char* name;  // under the temporary folder, or an absolute path
+  unsigned int accessMode;
+};
+
+class BasicFileSpecial : public ::testing::TestWithParam<SpecialFile> {};
+
+TEST_P(BasicFileSpecial, IsRefusedAtOpen) {
+  vxtest::TempDir tmp;
+  ASSERT_EQ(0, mkfifo(tmp.Path("pipe").c_str(), 0600));
+  ASSERT_EQ(0, mkdir(tmp.Path("folder").c_str(), 0700));
+  const std::string path = GetParam().name[0] == '/' ? GetParam().name : tmp.Path(GetParam().name);
+  vxBasicFile file(path.c_str(), GetParam().accessMode, GetParam().accessMode, 0);
+  ASSERT_NE(0, file.Open());  // and never reaches a read that would not end
+  vxStringBase text;
+  EXPECT_NE(0, file.ReadAll(text));
+}
+
+INSTANTIATE_TEST_SUITE_P(NotRegular, BasicFileSpecial,
+                         ::testing::Values(SpecialFile{"pipe", O_RDONLY}, SpecialFile{"pipe", O_RDWR},
+                                           SpecialFile{"/dev/zero", O_RDONLY},
+                                           SpecialFile{"folder", O_RDONLY}));
+
 }  // namespace
