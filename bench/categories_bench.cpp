@@ -12,20 +12,10 @@
 #include <string>
 #include <vector>
 
+#include "bench/bench_files.h"
 #include "migrate/manager.h"
 
 namespace {
-
-std::string MakeTempFolder() {
-  char pattern[] = "/tmp/vxmbench.XXXXXX";
-  if (mkdtemp(pattern) == nullptr) abort();
-  return pattern;
-}
-
-void Write(const std::string& path, const std::string& text) {
-  std::ofstream out(path, std::ios::binary | std::ios::trunc);
-  out << text;
-}
 
 // categories categories of perCategory entries each; entry numbers start at first.
 std::string CategoriesFile(const std::string& folder, int categories, int perCategory, int first) {

@@ -12,20 +12,10 @@
 #include <vector>
 
 #include "crypt/protected_value.h"
+#include "bench/bench_files.h"
 #include "migrate/manager.h"
 
 namespace {
-
-std::string MakeTempFolder() {
-  char pattern[] = "/tmp/vxmbench.XXXXXX";
-  if (mkdtemp(pattern) == nullptr) abort();
-  return pattern;
-}
-
-void Write(const std::string& path, const std::string& text) {
-  std::ofstream out(path, std::ios::binary | std::ios::trunc);
-  out << text;
-}
 
 std::string Legacy(const std::string& clear) {
   std::vector<char> text(clear.begin(), clear.end());
