@@ -118,6 +118,14 @@ Outcome CheckDestination(const CopyJob& job, int dstDirFd, const char* name, con
   return Newer(src.st.st_mtim, dst.st_mtim) ? Outcome::kCopied : Outcome::kLeftInPlace;
 }
 
+// A folder the copy created takes its source's mode and times once it is filled (filling it would
+// change its times again).
+void StampFolder(int fd, const struct stat& source) {
+  const struct timespec times[2] = {source.st_atim, source.st_mtim};
+  fchmod(fd, source.st_mode & 07777);
+  futimens(fd, times);
+}
+
 // Copies the content of in to out, both at their current offsets. The kernel copy serves the
 // bytes fstat promised; read(2) finishes whatever it could not, up to the real end of the file.
 bool CopyBytes(CopyJob& job, int in, int out, off_t size) {
@@ -236,11 +244,7 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   job.openFolders.push_back(id);
   CopyFolderContents(job, srcFd, dstFd, fresh, depth);
   job.openFolders.pop_back();
-  if (fresh) {
-    const struct timespec times[2] = {st.st_atim, st.st_mtim};
-    fchmod(dstFd, st.st_mode & 07777);
-    futimens(dstFd, times);
-  }
+  if (fresh) StampFolder(dstFd, st);
   close(dstFd);
   close(srcFd);
 }
@@ -366,11 +370,7 @@ int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to)
   if (job.destRoot != srcId) {
     job.openFolders.push_back(srcId);
     CopyFolderContents(job, srcFd, dstFd, fresh, 0);
-    if (fresh) {
-      const struct timespec times[2] = {st.st_atim, st.st_mtim};
-      fchmod(dstFd, st.st_mode & 07777);
-      futimens(dstFd, times);
-    }
+    if (fresh) StampFolder(dstFd, st);
   }
   close(dstFd);
   close(srcFd);
