@@ -1,11 +1,16 @@
-// Command-line validity, product ids, the checks that refuse a run, and the version ranges.
+// Command-line validity, product ids, the checks that refuse a run, the version ranges, and the
+// run sequence around the install script and the log.
 
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cstdlib>
+#include <filesystem>
+#include <memory>
 #include <string>
+#include <tuple>
+#include <utility>
 #include <vector>
 
 #include "migrate/driver_fixture.h"
@@ -14,134 +19,85 @@ namespace vxtest {
 namespace {
 
 TEST(ProductID, MatchesIgnoringCaseButNotBlanks) {
-  EXPECT_EQ(1, vxMigrationManager::GetProductID("PAVSUITE"));
-  EXPECT_EQ(-1, vxMigrationManager::GetProductID("pavsuite "));
-  EXPECT_EQ(-1, vxMigrationManager::GetProductID(""));
-  EXPECT_EQ(-1, vxMigrationManager::GetProductID(nullptr));
-  EXPECT_EQ(20, vxMigrationManager::GetProductID("obx"));
-  EXPECT_EQ(21, vxMigrationManager::GetProductID("Tqrs"));
-  EXPECT_EQ(19, vxMigrationManager::GetProductID("vxobx_linux"));
-}
-
-struct CommandLineCase {
-  const char* name;
-  std::vector<std::string> options;
-  bool valid;
-};
-
-class CommandLineValidity : public ::testing::TestWithParam<CommandLineCase> {};
-
-TEST_P(CommandLineValidity, NeedsSixOptionsAndAKnownDestinationProduct) {
-  std::vector<std::string> args = {"vxmigrate"};
-  for (const std::string& option : GetParam().options) args.push_back(option);
-  std::vector<char*> argv;
-  for (std::string& arg : args) argv.push_back(&arg[0]);
-  MigrationCmdLineParser parser(static_cast<int>(argv.size()), argv.data());
-  EXPECT_EQ(GetParam().valid ? 1 : 0, parser.ParseCommand());
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    Cases, CommandLineValidity,
-    ::testing::Values(
-        CommandLineCase{"Complete", {"-D1:a", "-D2:b", "-P1:x", "-P2:pavsuite", "-V1:1", "-V2:2"}, true},
-        CommandLineCase{"EmptyValuesPass", {"-D1:", "-D2", "-P1:", "-P2:obx", "-V1:", "-V2:"}, true},
-        CommandLineCase{"UnknownDestination", {"-D1:a", "-D2:b", "-P1:x", "-P2:nosuch", "-V1:1", "-V2:2"}, false},
-        CommandLineCase{"NoSourceProduct", {"-D1:a", "-D2:b", "-P2:obx", "-V1:1", "-V2:2"}, false},
-        CommandLineCase{"NoDestinationFolder", {"-D1:a", "-P1:x", "-P2:obx", "-V1:1", "-V2:2"}, false},
-        CommandLineCase{"NamesAreCaseSensitive", {"-d1:a", "-D2:b", "-P1:x", "-P2:obx", "-V1:1", "-V2:2"}, false},
-        CommandLineCase{"ExtrasDoNotMatter", {"-D1:C:\\old", "-D2:b", "-P1:x", "-P2:obx", "-V1:1", "-V2:2", "-FT:N", "stray"}, true}),
-    [](const ::testing::TestParamInfo<CommandLineCase>& info) { return info.param.name; });
-
-TEST(CommandLine, ValuesKeepTheirOwnSeparators) {
-  std::vector<std::string> args = {"vxmigrate", "-D1:C:\\old:x", "-PFLog:a.wlp,b.wlp"};
-  std::vector<char*> argv;
-  for (std::string& arg : args) argv.push_back(&arg[0]);
-  MigrationCmdLineParser parser(static_cast<int>(argv.size()), argv.data());
-  parser.ParseCommand();
-  EXPECT_EQ("C:\\old:x", parser.GetValue("D1").str());
-  EXPECT_EQ("a.wlp,b.wlp", parser.GetValue("PFLog").str());
-  EXPECT_FALSE(parser.Exists("PFLink"));
-}
-
-// Runs the checks with folders relative to a fresh current folder, as a user might type them.
-struct FolderCase {
-  const char* source;
-  const char* destination;
-  bool refused;
-};
-
-class ChildFolderCheck : public ::testing::TestWithParam<FolderCase> {};
-
-TEST_P(ChildFolderCheck, RefusesADestinationBelowTheSource) {
-  TempDir root;
-  char previous[4096];
-  ASSERT_NE(nullptr, getcwd(previous, sizeof previous));
-  ASSERT_EQ(0, chdir(root.path().c_str()));
-  MakeDirs(root.Path(GetParam().source));
-  MakeDirs(root.Path(GetParam().destination));
-  {
-    auto manager = MakeManager({"vxmigrate", std::string("-D1:") + GetParam().source,
-                                std::string("-D2:") + GetParam().destination, "-P1:pavsuite",
-                                "-P2:pavsuite", "-V1:5.0", "-V2:5.5"});
-    EXPECT_EQ(GetParam().refused ? 1 : 0, manager->DoCheckMigrateValidity());
+  for (const auto& [name, id] : std::vector<std::pair<const char*, int>>{
+           {"PAVSUITE", 1}, {"pavsuite ", -1}, {"", -1}, {nullptr, -1}, {"obx", 20}, {"Tqrs", 21},
+           {"vxobx_linux", 19}}) {
+    EXPECT_EQ(id, vxMigrationManager::GetProductID(name)) << (name ? name : "(null)");
   }
-  std::vector<std::string> log = LogEntries(root.Path(std::string(GetParam().destination) + "/vxmigrate.log"));
-  bool logged = !log.empty() && log.back().find("cannot be child of source") != std::string::npos;
-  EXPECT_EQ(GetParam().refused, logged);
-  ASSERT_EQ(0, chdir(previous));
 }
 
-INSTANTIATE_TEST_SUITE_P(Cases, ChildFolderCheck,
-                         ::testing::Values(FolderCase{"a", "a", false},
-                                           FolderCase{"a/", "a/", false},
-                                           FolderCase{"a/", "a", false},
-                                           FolderCase{"a", "a/new", true},
-                                           FolderCase{"a/", "a/new", true},
-                                           FolderCase{"a", "ab/new", true},
-                                           FolderCase{"a", "xa/b", true},
-                                           FolderCase{"a", "xya/b", false},
-                                           FolderCase{"a", "b", false}));
-
-struct VersionCase {
-  const char* p1;
-  const char* p2;
-  const char* v1;
-  const char* v2;
-  int result;
-};
-
-class VersionOrderCheck : public ::testing::TestWithParam<VersionCase> {};
-
-TEST_P(VersionOrderCheck, ComparesMajorAndMinorOfOneProductOnly) {
-  TempDir root;
-  auto manager = MakeRun(root, GetParam().p1, GetParam().p2, GetParam().v1, GetParam().v2);
-  EXPECT_EQ(GetParam().result, manager->DoCheckMigrateValidity());
+// A parser over "vxmigrate" and the options, after ParseCommand.
+std::unique_ptr<MigrationCmdLineParser> Parse(std::vector<std::string> args) {
+  args.insert(args.begin(), "vxmigrate");
+  std::vector<char*> argv;
+  for (std::string& arg : args) argv.push_back(&arg[0]);
+  auto parser = std::make_unique<MigrationCmdLineParser>(static_cast<int>(argv.size()), argv.data());
+  parser->ParseCommand();
+  return parser;
 }
 
-INSTANTIATE_TEST_SUITE_P(Cases, VersionOrderCheck,
-                         ::testing::Values(VersionCase{"pavsuite", "pavsuite", "5.1", "5.0", 1},
-                                           VersionCase{"pavsuite", "pavsuite", "5.1.3", "5.1.0", 0},
-                                           VersionCase{"pavsuite", "pavsuite", "6.0", "5.9", 1},
-                                           VersionCase{"halsuite", "obx", "6.0", "5.0", 0},
-                                           VersionCase{"nosuch", "obx", "1.0", "2.0", 1}));
+TEST(CommandLine, NeedsSixOptionsAndAKnownDestinationProductAndKeepsValueSeparators) {
+  for (const auto& [options, expected] : std::vector<std::pair<std::vector<std::string>, int>>{
+           {{"-D1:a", "-D2:b", "-P1:x", "-P2:pavsuite", "-V1:1", "-V2:2"}, 1},
+           {{"-D1:", "-D2", "-P1:", "-P2:obx", "-V1:", "-V2:"}, 1},  // empty values pass
+           {{"-D1:a", "-D2:b", "-P1:x", "-P2:nosuch", "-V1:1", "-V2:2"}, 0},
+           {{"-D1:a", "-D2:b", "-P2:obx", "-V1:1", "-V2:2"}, 0},
+           {{"-D1:a", "-P1:x", "-P2:obx", "-V1:1", "-V2:2"}, 0},
+           {{"-d1:a", "-D2:b", "-P1:x", "-P2:obx", "-V1:1", "-V2:2"}, 0},  // names are case sensitive
+           {{"-D1:C:\\old", "-D2:b", "-P1:x", "-P2:obx", "-V1:1", "-V2:2", "-FT:N", "stray"}, 1}}) {
+    EXPECT_EQ(expected, Parse(options)->IsValid()) << ::testing::PrintToString(options);
+  }
+  auto parser = Parse({"-D1:C:\\old:x", "-PFLog:a.wlp,b.wlp"});
+  EXPECT_EQ("C:\\old:x", parser->GetValue("D1").str());
+  EXPECT_EQ("a.wlp,b.wlp", parser->GetValue("PFLog").str());
+  EXPECT_FALSE(parser->Exists("PFLink"));
+}
+
+// Folders relative to a fresh current folder, as a user might type them.
+TEST(Checks, RefuseADestinationBelowTheSourceButNotTheSameFolder) {
+  const std::filesystem::path previous = std::filesystem::current_path();
+  using Case = std::tuple<std::string, std::string, int>;  // source, destination, refused
+  for (const auto& [source, destination, refused] : std::vector<Case>{
+           {"a", "a", 0}, {"a/", "a/", 0}, {"a/", "a", 0}, {"a", "a/new", 1}, {"a/", "a/new", 1},
+           {"a", "ab/new", 1}, {"a", "xa/b", 1}, {"a", "xya/b", 0}, {"a", "b", 0}}) {
+    TempDir root;
+    std::filesystem::current_path(root.path());
+    MakeDirs(root.Path(source));
+    MakeDirs(root.Path(destination));
+    EXPECT_EQ(refused, MakeManager({"vxmigrate", "-D1:" + source, "-D2:" + destination, "-P1:pavsuite",
+                                    "-P2:pavsuite", "-V1:5.0", "-V2:5.5"})->DoCheckMigrateValidity())
+        << source << " -> " << destination;
+    std::string last = LogEntries(root.Path(destination + "/vxmigrate.log")).back();
+    EXPECT_EQ(refused == 1, last.find("cannot be child of source") != std::string::npos) << last;
+    std::filesystem::current_path(previous);
+  }
+}
+
+TEST(Checks, CompareMajorAndMinorOfOneProductOnly) {
+  for (const std::vector<std::string>& c : std::vector<std::vector<std::string>>{
+           {"pavsuite", "pavsuite", "5.1.3", "5.1.0", "0"}, {"pavsuite", "pavsuite", "6.0", "5.9", "1"},
+           {"halsuite", "obx", "6.0", "5.0", "0"}}) {
+    TempDir root;
+    EXPECT_EQ(std::stoi(c[4]), MakeRun(root, c[0], c[1], c[2], c[3])->DoCheckMigrateValidity())
+        << ::testing::PrintToString(c);
+  }
+}
 
 TEST(VersionRanges, AcceptInclusiveBoundsAndReportAMissingFile) {
   TempDir root;
   auto manager = MakeRun(root, "halsuite", "obx", "5.5", "3.0");
-  vxStringBase halsuite("halsuite");
-  vxStringBase obx("obx");
+  vxStringBase halsuite("halsuite"), obx("obx");
   EXPECT_EQ(2, manager->DoCheckVersions(halsuite, obx));
   EXPECT_EQ("Error: Unable to open file:   " + root.Path("bin/vxmigrate.ini"),
             LogEntries(root.Path("dst/vxmigrate.log")).back());
-
-  WriteFile(root.Path("bin/vxmigrate.ini"),
-            "[HalSuite]\nLow=5.5\nHigh=6.0\n[obx]\nlow=2.0\nhigh=3.0\n");
-  EXPECT_EQ(0, manager->DoCheckVersions(halsuite, obx));
-  WriteFile(root.Path("bin/vxmigrate.ini"), "[halsuite]\nLow=5.6\nHigh=6.0\n[obx]\nLow=2.0\nHigh=3.0\n");
-  EXPECT_EQ(1, manager->DoCheckVersions(halsuite, obx));
-  // A section without "High" admits no real version: its bound reads as 0.0.0.
-  WriteFile(root.Path("bin/vxmigrate.ini"), "[halsuite]\nLow=5.0\n[obx]\nLow=2.0\nHigh=3.0\n");
-  EXPECT_EQ(1, manager->DoCheckVersions(halsuite, obx));
+  for (const auto& [ranges, result] : std::vector<std::pair<std::string, int>>{
+           {"[HalSuite]\nLow=5.5\nHigh=6.0\n[obx]\nlow=2.0\nhigh=3.0\n", 0},
+           {"[halsuite]\nLow=5.6\nHigh=6.0\n[obx]\nLow=2.0\nHigh=3.0\n", 1},
+           // A section without "High" admits no real version: its bound reads as 0.0.0.
+           {"[halsuite]\nLow=5.0\n[obx]\nLow=2.0\nHigh=3.0\n", 1}}) {
+    WriteFile(root.Path("bin/vxmigrate.ini"), ranges);
+    EXPECT_EQ(result, manager->DoCheckVersions(halsuite, obx)) << ranges;
+  }
 }
 
 TEST(RunQuestions, InPlaceAndInline) {
@@ -166,21 +122,13 @@ TEST(RunQuestions, InPlaceAndInline) {
 
 TEST(Executable, IsFoundFromTheProgramNameAsAShellWould) {
   TempDir root;
-  MakeDirs(root.Path("src"));
-  MakeDirs(root.Path("dst"));
-  std::vector<std::string> options = {"-D1:" + root.Path("src"), "-D2:" + root.Path("dst"),
-                                      "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.0"};
   auto run = [&](const std::string& program) {
-    std::vector<std::string> args = {program};
-    args.insert(args.end(), options.begin(), options.end());
-    return MakeManager(args)->GetExecutable().str();
+    return MakeManager({program, "-D1:" + root.Path("src"), "-D2:" + root.Path("dst"), "-P1:log",
+                        "-P2:log", "-V1:6.0", "-V2:6.0"})->GetExecutable().str();
   };
-  char cwd[4096];
-  ASSERT_NE(nullptr, getcwd(cwd, sizeof cwd));
   EXPECT_EQ("/opt/vx/bin/vxmigrate", run("/opt/vx/bin/vxmigrate"));
-  EXPECT_EQ(std::string(cwd) + "/./bin/tool", run("bin/tool"));
-  EXPECT_EQ(std::string(cwd) + "/./tool", run("./tool"));
-
+  EXPECT_EQ(std::filesystem::current_path().string() + "/./bin/tool", run("bin/tool"));
+  EXPECT_EQ(std::filesystem::current_path().string() + "/./tool", run("./tool"));
   WriteFile(root.Path("p1/vxtool"), "not executable");
   WriteFile(root.Path("p2/vxtool"), "#!/bin/sh\n");
   chmod(root.Path("p2/vxtool").c_str(), 0755);
@@ -189,6 +137,27 @@ TEST(Executable, IsFoundFromTheProgramNameAsAShellWould) {
   EXPECT_EQ(root.Path("p2/vxtool"), run("vxtool"));
   EXPECT_EQ("", run("nosuchtool"));
   setenv("PATH", savedPath.c_str(), 1);
+}
+
+// The log replaces a link in its place instead of writing through it; the install script runs in
+// the destination and the current folder comes back afterwards.
+TEST(RunSequence, TheLogReplacesALinkAndTheFolderComesBackAfterTheScript) {
+  TempDir root;
+  WriteFile(root.Path("src/keep.txt"), "customer data\n");
+  MakeDirs(root.Path("dst"));
+  ASSERT_EQ(0, symlink(root.Path("src/keep.txt").c_str(), root.Path("dst/vxmigrate.log").c_str()));
+  auto manager = MakeRun(root, "log", "log", "6.0", "6.5");
+  EXPECT_EQ("customer data\n", ReadFile(root.Path("src/keep.txt")));
+  struct stat st;
+  ASSERT_EQ(0, lstat(root.Path("dst/vxmigrate.log").c_str(), &st));
+  EXPECT_TRUE(S_ISREG(st.st_mode));
+  EXPECT_EQ(11u, LogEntries(root.Path("dst/vxmigrate.log")).size());  // the header
+  WriteFile(root.Path("dst/synchinstall.sh"), "#!/bin/sh\npwd > ran_in.txt\n");
+  chmod(root.Path("dst/synchinstall.sh").c_str(), 0755);
+  const std::filesystem::path before = std::filesystem::current_path();
+  EXPECT_EQ(0, manager->DoMigration());
+  EXPECT_EQ(before, std::filesystem::current_path());
+  EXPECT_EQ(root.Path("dst") + "\n", ReadFile(root.Path("dst/ran_in.txt")));
 }
 
 }  // namespace

@@ -23,9 +23,7 @@ inline std::unique_ptr<vxMigrationManager> MakeManager(std::vector<std::string> 
 inline std::unique_ptr<vxMigrationManager> MakeRun(const TempDir& root, const std::string& p1,
                                                    const std::string& p2, const std::string& v1,
                                                    const std::string& v2) {
-  MakeDirs(root.Path("src"));
-  MakeDirs(root.Path("dst"));
-  MakeDirs(root.Path("bin"));
+  for (const char* folder : {"src", "dst", "bin"}) MakeDirs(root.Path(folder));
   return MakeManager({root.Path("bin/vxmigrate"), "-D1:" + root.Path("src"),
                       "-D2:" + root.Path("dst"), "-P1:" + p1, "-P2:" + p2, "-V1:" + v1,
                       "-V2:" + v2});

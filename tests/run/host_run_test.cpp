@@ -2,292 +2,233 @@
 // choice, version ranges, command files, refusals, the install script and the log's exact texts.
 
 #include <gtest/gtest.h>
-#include <unistd.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
 
+#include <algorithm>
+#include <cstdlib>
+#include <filesystem>
+#include <memory>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include "foundation/files/shared_lib.h"
-#include "run/host_fixture.h"
 #include "support/live_process.h"
 #include "support/test_files.h"
 
 namespace vxtest {
 namespace {
 
+using Lines = std::vector<std::string>;
+
 const char kNoPlugin[] =
     "Error: No appropriate migration libraries found.  There may not be support for the products "
     "or versions being migrated.  Check the readme file for more info.";
 
-std::vector<std::string> Header(const HostRun& run, const std::string& p1, const std::string& p2,
-                                const std::string& v1, const std::string& v2) {
-  return {"VXMigrate Log File: " + run.Log(),
-          "VXMigrate Executable: " + run.bin() + "/vxmigrate",
-          "Source Path: " + run.src(),
-          "Destination Path: " + run.dst(),
-          "Source Version: " + v1,
-          "Destination Version: " + v2,
-          "Source Product: " + p1,
-          "Destination Product: " + p2,
-          "\r",
-          "\r"};
+std::string Replace(std::string text, const std::string& mark, const std::string& value) {
+  size_t at = text.find(mark);
+  return at == std::string::npos ? text : text.replace(at, mark.size(), value);
 }
 
-// The log's entries after the header (the header's last entry, "\r\n\r\n", spans three lines).
-std::vector<std::string> Body(const HostRun& run) {
-  std::vector<std::string> entries = LogEntries(run.Log());
-  if (entries.size() < 11) return entries;
-  return std::vector<std::string>(entries.begin() + 11, entries.end());
-}
+// A temporary bin folder holding a copy of the host, its library, "vxmigrate.ini" (unless told
+// otherwise) and the named test plug-ins, beside empty "src" and "dst" folders.
+class HostRun {
+  TempDir root_;
 
-std::vector<std::string> ScriptLines(const HostRun& run) {
-  return {"Looking for Synch Install Script: " + run.dst() + "/synchinstall.sh"};
-}
+ public:
+  const std::string bin = root_.Path("bin"), src = root_.Path("src"), dst = root_.Path("dst");
+  const std::string log = dst + "/vxmigrate.log";
 
-TEST(HostRun, FirstFittingPluginRunsAndTheLogReadsInOrder) {
-  HostRun run({"p05_halsuite_obx", "p10_pavsuite", "p20_pavsuite"});
-  HostResult result = run.Run(run.RunOptions("pavsuite", "PAVSUITE", "5.0", "5.5"));
-  EXPECT_EQ(0, result.exitCode) << result.err;
-  EXPECT_EQ("VXMigrate log: " + run.Log() + "\n", result.out);
+  explicit HostRun(const Lines& plugins, bool ranges = true) {
+    for (const std::string& folder : {src, dst}) MakeDirs(folder);
+    std::string host = VXM_HOST_EXE;
+    Copy(host, "vxmigrate");
+    Copy(host.substr(0, host.rfind('/')) + "/libvxmigrate.so.0", "libvxmigrate.so.0");
+    for (const std::string& name : plugins) Copy(VXM_TEST_PLUGIN_DIR "/" + name + ".so", name + ".so");
+    if (ranges) {
+      WriteFile(bin + "/vxmigrate.ini",
+                "[pavsuite]\nLow=4.0\nHigh=6.5\n\n[halsuite]\nLow=4.0\nHigh=6.5\n\n[log]\nLow=5.0\n"
+                "High=7.0\n\n[obx]\nLow=1.0\nHigh=4.5\n\n[tradeq]\nLow=1.0\nHigh=9.0\n");
+    }
+  }
 
-  std::vector<std::string> entries = LogEntries(run.Log());
-  std::vector<std::string> header = Header(run, "pavsuite", "PAVSUITE", "5.0", "5.5");
-  ASSERT_GE(entries.size(), header.size() + 1);
-  EXPECT_EQ(header, std::vector<std::string>(entries.begin(), entries.begin() + header.size()));
-  EXPECT_EQ("", entries[header.size()]);  // the blank line the "\r\n\r\n" entry ends with
+  std::string Path(const std::string& relative) const { return root_.Path(relative); }
+  std::string Pointer() const { return "** See VXMigrate Log File for details:  " + log; }
+  std::string Script() const { return dst + "/synchinstall.sh"; }
 
-  std::vector<std::string> expected = {"Test plug-in ran: p10"};
-  for (const std::string& line : ScriptLines(run)) expected.push_back(line);
-  expected.push_back("** See VXMigrate Log File for details:  " + run.Log());
-  EXPECT_EQ(expected, Body(run));
-  EXPECT_EQ("p10 " + run.src() + " " + run.dst() + " 5.0 5.5 1 1 FT=\n",
-            ReadFile(run.dst() + "/plugin_calls.txt"));
-}
+  // Runs the host with argv[0] = its full path and the given options; its exit status.
+  int Run(const Lines& options) const {
+    std::string command = "'" + bin + "/vxmigrate'";
+    for (const std::string& option : options) command += " '" + option + "'";
+    int status = system((command + " >" + Path("out.txt") + " 2>" + Path("err.txt")).c_str());
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+  }
+  std::string Out() const { return ReadFile(Path("out.txt")); }
+  std::string Err() const { return ReadFile(Path("err.txt")); }
 
-TEST(HostRun, NoFittingPluginStillRunsTheScriptStepAndSucceeds) {
-  HostRun run({"p10_pavsuite"});
-  HostResult result = run.Run(run.RunOptions("tradeq", "tradeq", "2.0", "2.1"));
-  EXPECT_EQ(0, result.exitCode);
-  std::vector<std::string> expected = ScriptLines(run);
-  expected.push_back(kNoPlugin);
-  expected.push_back("** See VXMigrate Log File for details:  " + run.Log());
-  EXPECT_EQ(expected, Body(run));
-  EXPECT_FALSE(FileExists(run.dst() + "/plugin_calls.txt"));
-}
+  // The six run options over src and dst for products and versions {P1, P2, V1, V2}.
+  Lines Options(const Lines& p) const {
+    return {"-D1:" + src, "-D2:" + dst, "-P1:" + p[0], "-P2:" + p[1], "-V1:" + p[2], "-V2:" + p[3]};
+  }
 
-TEST(HostRun, PluginWithoutMigrateEndsTheSearch) {
-  HostRun run({"p15_log_without_migrate", "p30_log"});
-  HostResult result = run.Run(run.RunOptions("log", "log", "6.0", "6.1"));
-  EXPECT_EQ(0, result.exitCode);
-  EXPECT_FALSE(FileExists(run.dst() + "/plugin_calls.txt"));
-  EXPECT_EQ(kNoPlugin, Body(run).at(1));
-}
+  // The log's entries after the header (the header's last entry, "\r\n\r\n", spans three lines).
+  Lines Body() const {
+    Lines entries = LogEntries(log);
+    return Lines(entries.begin() + std::min<size_t>(11, entries.size()), entries.end());
+  }
 
-TEST(HostRun, VersionsOutsideTheRangesSkipThePlugin) {
-  HostRun run({"p10_pavsuite"});
-  HostResult result = run.Run(run.RunOptions("pavsuite", "pavsuite", "3.9", "5.5"));
-  EXPECT_EQ(0, result.exitCode);
-  EXPECT_FALSE(FileExists(run.dst() + "/plugin_calls.txt"));
-  EXPECT_EQ(kNoPlugin, Body(run).at(1));
-  // Both bounds are inclusive.
-  HostRun edge({"p10_pavsuite"});
-  edge.Run(edge.RunOptions("pavsuite", "pavsuite", "4.0", "6.5"));
-  EXPECT_TRUE(FileExists(edge.dst() + "/plugin_calls.txt"));
-}
+ private:
+  void Copy(const std::string& from, const std::string& name) const {
+    WriteFile(bin + "/" + name, ReadFile(from));
+    chmod((bin + "/" + name).c_str(), 0755);
+  }
+};
 
-TEST(HostRun, MissingRangeFileStopsTheSearchWithItsMessages) {
-  HostRun run({"p10_pavsuite", "p20_pavsuite"}, nullptr);
-  HostResult result = run.Run(run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5"));
-  EXPECT_EQ(0, result.exitCode);
-  std::vector<std::string> expected = {
-      "Error: Unable to open file:   " + run.bin() + "/vxmigrate.ini",
-      "Error: Can't open vxmigrate.ini - make sure it's present and isn't read only"};
-  for (const std::string& line : ScriptLines(run)) expected.push_back(line);
-  expected.push_back(kNoPlugin);
-  expected.push_back("** See VXMigrate Log File for details:  " + run.Log());
-  EXPECT_EQ(expected, Body(run));
-}
-
-TEST(HostRun, SomethingThatIsNotASharedObjectIsSkipped) {
-  HostRun run({"p10_pavsuite"});
-  WriteFile(run.bin() + "/a_text_file.so", "this is not a library\n");
-  WriteFile(run.bin() + "/b_truncated.so", ReadFile(std::string(VXM_TEST_PLUGIN_DIR) +
-                                                    "/p20_pavsuite.so").substr(0, 300));
-  HostResult result = run.Run(run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5"));
-  EXPECT_EQ(0, result.exitCode) << result.err;
-  EXPECT_EQ("p10", ReadFile(run.dst() + "/plugin_calls.txt").substr(0, 3));
+TEST(HostRun, ChoosesThePluginAndWritesTheWholeLogInOrder) {
+  struct {
+    Lines plugins;
+    bool ranges;      // false: no vxmigrate.ini beside the host
+    Lines options;    // P1, P2, V1, V2
+    std::string ran;  // the plug-in that must run, "" for none
+  } cases[] = {
+      {{"p05_halsuite_obx", "p10_pavsuite", "p20_pavsuite"}, true,
+       {"pavsuite", "PAVSUITE", "5.0", "5.5"}, "p10"},
+      {{"p10_pavsuite"}, true, {"tradeq", "tradeq", "2.0", "2.1"}, ""},
+      {{"p15_log_without_migrate", "p30_log"}, true, {"log", "log", "6.0", "6.1"}, ""},  // search ends
+      {{"p10_pavsuite"}, true, {"pavsuite", "pavsuite", "3.9", "5.5"}, ""},
+      {{"p10_pavsuite"}, true, {"pavsuite", "pavsuite", "5.0", "6.6"}, ""},
+      {{"p10_pavsuite"}, true, {"pavsuite", "pavsuite", "4.0", "6.5"}, "p10"},  // bounds are inclusive
+      {{"p10_pavsuite", "p20_pavsuite"}, false, {"pavsuite", "pavsuite", "5.0", "5.5"}, ""}};
+  for (const auto& c : cases) {
+    const Lines& o = c.options;
+    SCOPED_TRACE(::testing::PrintToString(c.plugins) + ::testing::PrintToString(o));
+    HostRun run(c.plugins, c.ranges);
+    // Two .so files that are not shared objects come first: they are skipped.
+    WriteFile(run.bin + "/a_text_file.so", "this is not a library\n");
+    WriteFile(run.bin + "/b_truncated.so",
+              ReadFile(VXM_TEST_PLUGIN_DIR "/p20_pavsuite.so").substr(0, 300));
+    EXPECT_EQ(0, run.Run(run.Options(o))) << run.Err();
+    EXPECT_EQ("VXMigrate log: " + run.log + "\n", run.Out());
+    // The header's last entry, "\r\n\r\n", spans three lines.
+    Lines log = {"VXMigrate Log File: " + run.log, "VXMigrate Executable: " + run.bin + "/vxmigrate",
+                 "Source Path: " + run.src, "Destination Path: " + run.dst, "Source Version: " + o[2],
+                 "Destination Version: " + o[3], "Source Product: " + o[0],
+                 "Destination Product: " + o[1], "\r", "\r", ""};
+    if (!c.ranges) {
+      log.push_back("Error: Unable to open file:   " + run.bin + "/vxmigrate.ini");
+      log.push_back("Error: Can't open vxmigrate.ini - make sure it's present and isn't read only");
+    }
+    if (!c.ran.empty()) log.push_back("Test plug-in ran: " + c.ran);
+    log.push_back("Looking for Synch Install Script: " + run.Script());
+    if (c.ran.empty()) log.push_back(kNoPlugin);
+    log.push_back(run.Pointer());
+    EXPECT_EQ(log, LogEntries(run.log));
+    std::string call = c.ran + " " + run.src + " " + run.dst + " " + o[2] + " " + o[3] + " 1 1 FT=\n";
+    EXPECT_EQ(c.ran.empty() ? "<missing>" : call, ReadFile(run.dst + "/plugin_calls.txt"));
+  }
 }
 
 // With no executable found, the current folder's listing gives bare names; they load from there.
 TEST(HostRun, PluginNamedWithoutAFolderLoadsFromTheCurrentFolder) {
-  char previous[4096];
-  ASSERT_NE(nullptr, getcwd(previous, sizeof previous));
-  ASSERT_EQ(0, chdir(VXM_TEST_PLUGIN_DIR));
-  {
-    vxSharedLib library("p10_pavsuite.so");
-    EXPECT_NE(nullptr, library.ProcAddr("MigrateInitialize")) << library.LoadError().str();
-  }
-  ASSERT_EQ(0, chdir(previous));
+  const std::filesystem::path previous = std::filesystem::current_path();
+  std::filesystem::current_path(VXM_TEST_PLUGIN_DIR);
+  EXPECT_NE(nullptr, vxSharedLib("p10_pavsuite.so").ProcAddr("MigrateInitialize"));
+  std::filesystem::current_path(previous);
 }
 
-TEST(HostRun, IncompleteCommandLinePrintsUsageAndWritesNoLog) {
+// No -V1, an unknown destination product, an unreadable command file.
+TEST(HostRun, IncompleteCommandLinePrintsUsageNamingEveryOptionAndWritesNoLog) {
   HostRun run({"p10_pavsuite"});
-  std::vector<std::string> options = run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5");
-  options.erase(options.begin() + 4);  // no -V1
-  HostResult result = run.Run(options);
-  EXPECT_EQ(1, result.exitCode);
-  for (const char* option : {"-D1", "-D2", "-P1", "-P2", "-V1", "-V2", "-FT", "-cmd", "-PFLog",
-                             "-PFProxy", "-PFStream", "-PFLink", "-PFAlert"}) {
-    EXPECT_NE(std::string::npos, result.err.find(option)) << option;
+  for (const Lines& options : {Lines{"-D1:" + run.src, "-D2:" + run.dst, "-P1:pavsuite", "-P2:pavsuite",
+                                     "-V2:5.5"},
+                               run.Options({"pavsuite", "nosuch", "5.0", "5.5"}),
+                               Lines{"-cmd:" + run.Path("nowhere/migcmd.ini")}}) {
+    EXPECT_EQ(1, run.Run(options));
+    std::string usage = run.Err();
+    for (const char* option : {"-D1", "-D2", "-P1", "-P2", "-V1", "-V2", "-FT", "-cmd", "-PFLog",
+                               "-PFProxy", "-PFStream", "-PFLink", "-PFAlert"}) {
+      EXPECT_NE(std::string::npos, usage.find(option)) << option;
+    }
+    EXPECT_EQ("", run.Out());
+    EXPECT_FALSE(FileExists(run.log));
   }
-  EXPECT_EQ("", result.out);
-  EXPECT_FALSE(FileExists(run.Log()));
-  // An unknown destination product is just as incomplete.
-  HostResult unknown = run.Run(run.RunOptions("pavsuite", "nosuch", "5.0", "5.5"));
-  EXPECT_EQ(1, unknown.exitCode);
-  EXPECT_FALSE(FileExists(run.Log()));
 }
 
-// Where the command file is looked for, by the value of "-cmd".
-struct CommandFileRoute {
-  const char* name;
-  const char* fileLocation;  // relative to the test root
-  const char* cmdOption;     // "" for none; "$ROOT" is replaced by the test root
-};
-
-class HostCommandFile : public ::testing::TestWithParam<CommandFileRoute> {};
-
-TEST_P(HostCommandFile, SuppliesTheMissingOptions) {
-  const CommandFileRoute& route = GetParam();
-  HostRun run({"p10_pavsuite"});
-  WriteFile(run.Path(route.fileLocation),
-            "[main]\nD1=" + run.src() + "\nD2=" + run.dst() +
-                "\nP1=pavsuite\nP2=pavsuite\nV1=5.0\nV2=5.5\nFT=N\n[profiles]\nLog=a.wlp\n");
-  std::vector<std::string> options = {"-V1:ignored"};
-  std::string cmd = route.cmdOption;
-  if (!cmd.empty()) {
-    size_t root = cmd.find("$ROOT");
-    if (root != std::string::npos) cmd.replace(root, 5, run.Path("").substr(0, run.Path("").size() - 1));
-    options.push_back("-cmd:" + cmd);
+TEST(HostRun, CommandFileIsFoundByEachRoute) {
+  // Where the file lies (under the test root) and the "-cmd" value, if any ("$ROOT/": the root).
+  for (const Lines& route : std::vector<Lines>{{"bin/migcmd.ini"},
+                                               {"cmds/migcmd.ini", "$ROOT/cmds"},
+                                               {"cmds/migcmd.ini", "$ROOT/cmds/"},
+                                               {"bin/other.ini", "other.ini"},
+                                               {"cmds/run1.ini", "$ROOT/cmds/run1.ini"}}) {
+    HostRun run({"p10_pavsuite"});
+    WriteFile(run.Path(route[0]), "[main]\nD1=" + run.src + "\nD2=" + run.dst + "\nP1=pavsuite\n"
+                                  "P2=pavsuite\nV1=5.0\nV2=5.5\nFT=N\n[profiles]\nLog=a.wlp\n");
+    Lines options = {"-V1:ignored"};
+    if (route.size() > 1) options.push_back("-cmd:" + Replace(route[1], "$ROOT/", run.Path("")));
+    EXPECT_EQ(0, run.Run(options)) << route.back() << run.Err();
+    EXPECT_EQ("p10 " + run.src + " " + run.dst + " 5.0 5.5 1 1 FT=N\n",
+              ReadFile(run.dst + "/plugin_calls.txt"));
   }
-  HostResult result = run.Run(options);
-  EXPECT_EQ(0, result.exitCode) << result.err;
-  EXPECT_EQ("p10 " + run.src() + " " + run.dst() + " 5.0 5.5 1 1 FT=N\n",
-            ReadFile(run.dst() + "/plugin_calls.txt"));
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Routes, HostCommandFile,
-    ::testing::Values(CommandFileRoute{"ModuleFolder", "bin/migcmd.ini", ""},
-                      CommandFileRoute{"Folder", "cmds/migcmd.ini", "$ROOT/cmds"},
-                      CommandFileRoute{"FolderWithSlash", "cmds/migcmd.ini", "$ROOT/cmds/"},
-                      CommandFileRoute{"BareNameInModuleFolder", "bin/other.ini", "other.ini"},
-                      CommandFileRoute{"FullPath", "cmds/run1.ini", "$ROOT/cmds/run1.ini"}),
-    [](const ::testing::TestParamInfo<CommandFileRoute>& info) { return info.param.name; });
-
-TEST(HostRun, UnreadableCommandFileLeavesTheRunInvalid) {
-  HostRun run({"p10_pavsuite"});
-  HostResult result = run.Run({"-cmd:" + run.Path("nowhere/migcmd.ini")});
-  EXPECT_EQ(1, result.exitCode);
-  EXPECT_FALSE(FileExists(run.Log()));
-}
-
-struct Refusal {
-  const char* name;
-  const char* source;       // relative to the test root
-  const char* destination;  // relative to the test root
-  const char* p1;
-  const char* p2;
-  const char* v1;
-  const char* v2;
-  const char* message;      // the log line before the pointer line ($SRC, $DST: the folders)
-};
-
-class HostRefusal : public ::testing::TestWithParam<Refusal> {};
-
-TEST_P(HostRefusal, EndsWithItsMessageAndResultOne) {
-  const Refusal& refusal = GetParam();
-  HostRun run({"p10_pavsuite"});
-  std::string source = run.Path(refusal.source);
-  std::string destination = run.Path(refusal.destination);
-  MakeDirs(destination);
-  HostResult result = run.Run({"-D1:" + source, "-D2:" + destination, std::string("-P1:") + refusal.p1,
-                               std::string("-P2:") + refusal.p2, std::string("-V1:") + refusal.v1,
-                               std::string("-V2:") + refusal.v2});
-  EXPECT_EQ(1, result.exitCode);
-  std::string message = refusal.message;
-  for (const auto& [mark, text] : {std::pair<std::string, std::string>{"$DST", destination},
-                                   std::pair<std::string, std::string>{"$SRC", source}}) {
-    size_t at = message.find(mark);
-    if (at != std::string::npos) message.replace(at, mark.size(), text);
+TEST(HostRun, RefusalsEndWithTheirMessageAndResultOne) {
+  const std::string child = "Error: Destination directory cannot be child of source directory: $DST";
+  // Source and destination (under the test root), P1, V1, V2, the log line before the pointer.
+  for (const Lines& c : std::vector<Lines>{
+           {"src", "src/new", "pavsuite", "5.0", "5.5", child},
+           {"src/", "src/new", "pavsuite", "5.0", "5.5", child},
+           {"nosuch", "dst", "pavsuite", "5.0", "5.5", "Error: Source directory does not exist:  $SRC"},
+           {"src", "dst", "nosuch", "5.0", "5.5", "Error: Incorrect source product"},
+           {"src", "dst", "pavsuite", "5.1", "5.0",
+            "Error: Cannot migrate because source version greater than destination version"}}) {
+    HostRun run({"p10_pavsuite"});
+    std::string source = run.Path(c[0]), destination = run.Path(c[1]);
+    std::string log = destination + "/vxmigrate.log";
+    MakeDirs(destination);
+    EXPECT_EQ(1, run.Run({"-D1:" + source, "-D2:" + destination, "-P1:" + c[2], "-P2:pavsuite",
+                          "-V1:" + c[3], "-V2:" + c[4]})) << c[5];
+    Lines entries = LogEntries(log);
+    entries.insert(entries.begin(), 2, "");
+    EXPECT_EQ(Lines({Replace(Replace(c[5], "$DST", destination), "$SRC", source),
+                     "** See VXMigrate Log File for details:  " + log}),
+              Lines(entries.end() - 2, entries.end()));
+    EXPECT_FALSE(FileExists(destination + "/plugin_calls.txt"));
   }
-  std::vector<std::string> entries = LogEntries(destination + "/vxmigrate.log");
-  ASSERT_GE(entries.size(), 2u);
-  EXPECT_EQ(message, entries[entries.size() - 2]);
-  EXPECT_EQ("** See VXMigrate Log File for details:  " + destination + "/vxmigrate.log",
-            entries.back());
-  EXPECT_FALSE(FileExists(destination + "/plugin_calls.txt"));
 }
-
-INSTANTIATE_TEST_SUITE_P(
-    Checks, HostRefusal,
-    ::testing::Values(
-        Refusal{"DestinationInsideSource", "src", "src/new", "pavsuite", "pavsuite", "5.0", "5.5",
-                "Error: Destination directory cannot be child of source directory: $DST"},
-        Refusal{"DestinationInsideSourceWithSlash", "src/", "src/new", "pavsuite", "pavsuite", "5.0",
-                "5.5", "Error: Destination directory cannot be child of source directory: $DST"},
-        Refusal{"MissingSource", "nosuch", "dst", "pavsuite", "pavsuite", "5.0", "5.5",
-                "Error: Source directory does not exist:  $SRC"},
-        Refusal{"UnknownSourceProduct", "src", "dst", "nosuch", "pavsuite", "5.0", "5.5",
-                "Error: Incorrect source product"},
-        Refusal{"OlderDestination", "src", "dst", "pavsuite", "pavsuite", "5.1", "5.0",
-                "Error: Cannot migrate because source version greater than destination version"}),
-    [](const ::testing::TestParamInfo<Refusal>& info) { return info.param.name; });
 
 TEST(HostRun, MissingDestinationIsReportedOnStandardError) {
   HostRun run({"p10_pavsuite"});
-  std::vector<std::string> options = run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5");
+  Lines options = run.Options({"pavsuite", "pavsuite", "5.0", "5.5"});
   options[1] = "-D2:" + run.Path("nowhere");
-  HostResult result = run.Run(options);
-  EXPECT_EQ(1, result.exitCode);
-  EXPECT_EQ("vxmigrate: cannot write the log " + run.Path("nowhere") + "/vxmigrate.log\n", result.err);
+  EXPECT_EQ(1, run.Run(options));
+  EXPECT_EQ("vxmigrate: cannot write the log " + run.Path("nowhere") + "/vxmigrate.log\n", run.Err());
 }
 
-TEST(HostRun, RunningReportingServerRefusesTheRun) {
+TEST(HostRun, RunningReportingServerRefusesTheRunUntilItIsGone) {
   HostRun run({"p05_halsuite_obx"});
-  HostResult result;
-  {
-    LiveProcess server;
-    WriteFile(run.dst() + "/vxrs.pid", std::to_string(server.pid()) + "\n");
-    result = run.Run(run.RunOptions("halsuite", "obx", "5.5", "3.5"));
-  }
-  EXPECT_EQ(1, result.exitCode);
-  std::vector<std::string> body = Body(run);
-  ASSERT_EQ(2u, body.size());
-  EXPECT_EQ("Error: Cannot migrate while Halden Engine Server is running - shut down to migrate",
-            body[0]);
-  // Once the server is gone the same run goes through.
-  HostResult again = run.Run(run.RunOptions("halsuite", "obx", "5.5", "3.5"));
-  EXPECT_EQ(0, again.exitCode);
-  EXPECT_TRUE(FileExists(run.dst() + "/plugin_calls.txt"));
+  auto server = std::make_unique<LiveProcess>();
+  WriteFile(run.dst + "/vxrs.pid", std::to_string(server->pid()) + "\n");
+  EXPECT_EQ(1, run.Run(run.Options({"halsuite", "obx", "5.5", "3.5"})));
+  EXPECT_EQ(Lines({"Error: Cannot migrate while Halden Engine Server is running - shut down to migrate",
+                   run.Pointer()}), run.Body());
+  server.reset();
+  EXPECT_EQ(0, run.Run(run.Options({"halsuite", "obx", "5.5", "3.5"})));
+  EXPECT_TRUE(FileExists(run.dst + "/plugin_calls.txt"));
 }
 
-TEST(HostRun, InstallScriptRunsInTheDestinationAndTheFolderIsRestored) {
+TEST(HostRun, InstallScriptRunsInTheDestinationAndIsLogged) {
   HostRun run({"p10_pavsuite"});
-  WriteFile(run.dst() + "/synchinstall.sh", "#!/bin/sh\npwd > script_ran_in.txt\nexit 3\n");
-  chmod((run.dst() + "/synchinstall.sh").c_str(), 0755);
-  HostResult result = run.Run(run.RunOptions("pavsuite", "pavsuite", "5.0", "5.5"));
-  EXPECT_EQ(0, result.exitCode);  // the script's own status is not the run's
-  EXPECT_EQ(run.dst() + "\n", ReadFile(run.dst() + "/script_ran_in.txt"));
-  std::string script = run.dst() + "/synchinstall.sh";
-  std::vector<std::string> expected = {"Test plug-in ran: p10",
-                                       "Looking for Synch Install Script: " + script,
-                                       "Executing Synch Install Script: " + script,
-                                       "Spawning Script: ./synchinstall.sh",
-                                       "Done executing Synch Install Script.",
-                                       "** See VXMigrate Log File for details:  " + run.Log()};
-  EXPECT_EQ(expected, Body(run));
+  std::string script = run.Script();
+  WriteFile(script, "#!/bin/sh\npwd > script_ran_in.txt\nexit 3\n");
+  chmod(script.c_str(), 0755);
+  // The script's own status is not the run's.
+  EXPECT_EQ(0, run.Run(run.Options({"pavsuite", "pavsuite", "5.0", "5.5"})));
+  EXPECT_EQ(run.dst + "\n", ReadFile(run.dst + "/script_ran_in.txt"));
+  EXPECT_EQ(Lines({"Test plug-in ran: p10", "Looking for Synch Install Script: " + script,
+                   "Executing Synch Install Script: " + script, "Spawning Script: ./synchinstall.sh",
+                   "Done executing Synch Install Script.", run.Pointer()}),
+            run.Body());
 }
 
 }  // namespace
