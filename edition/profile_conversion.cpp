@@ -100,23 +100,31 @@ void UnwrapFilterSections(vxMappedINIFile& profile) {
   }
 }
 
+// A stored credential put into the form the OBX edition reads: protected, or in clear when clear
+// is set (converted first, so that any old form is read). An empty value stays empty.
+void ConvertCredential(vxMigrationManager* manager, vxStringBase& value, bool clear) {
+  if (value.isEmpty()) return;
+  manager->DoConvertEncryptedValue(value);
+  if (clear) manager->DoDecryptValue(value);
+}
+
+// The same for a key of section "Profile", changed in place.
+void ConvertProfileCredential(vxMigrationManager* manager, vxMappedINIFile& profile,
+                              const char* key, bool clear) {
+  vxStringBase value = profile.GetVal("Profile", key);
+  if (value.isEmpty()) return;
+  ConvertCredential(manager, value, clear);
+  profile.SetVal("Profile", key, value);
+}
+
 void ConvertSingleServer(vxMigrationManager* manager, vxMappedINIFile& profile) {
   vxStringBase path = profile.GetVal("Profile", "LogFilePath");
   if (path.length() > 8 && path.beginsWith("file:")) {
     StripFileScheme(path);
     profile.SetVal("Profile", "LogFilePath", path);
   }
-  vxStringBase user = profile.GetVal("Profile", "LogFileUserName");
-  if (!user.isEmpty()) {
-    manager->DoConvertEncryptedValue(user);
-    manager->DoDecryptValue(user);
-    profile.SetVal("Profile", "LogFileUserName", user);
-  }
-  vxStringBase password = profile.GetVal("Profile", "LogFilePassword");
-  if (!password.isEmpty()) {
-    manager->DoConvertEncryptedValue(password);
-    profile.SetVal("Profile", "LogFilePassword", password);
-  }
+  ConvertProfileCredential(manager, profile, "LogFileUserName", true);
+  ConvertProfileCredential(manager, profile, "LogFilePassword", false);
 }
 
 // A cluster's servers move from numbered keys of "Profile" ("ServerName", "ServerName2", ...) into
@@ -136,9 +144,8 @@ void ConvertCluster(vxMigrationManager* manager, vxMappedINIFile& profile) {
     vxStringBase password = profile.GetVal("Profile", passwordKey);
     const bool ftp = path.length() > 6 && path.beginsWith("ftp:");
     if (ftp) {
-      manager->DoConvertEncryptedValue(user);
-      manager->DoDecryptValue(user);
-      manager->DoConvertEncryptedValue(password);
+      ConvertCredential(manager, user, true);
+      ConvertCredential(manager, password, false);
     }
 
     const vxStringBase section(NumberedName("server", n));
@@ -182,17 +189,8 @@ bool ReadsPlainHomePageUser(vxMigrationManager* manager) {
 }
 
 void ConvertHomePageCredentials(vxMigrationManager* manager, vxMappedINIFile& profile) {
-  vxStringBase user = profile.GetVal("Profile", "HomePageUsername");
-  if (!user.isEmpty()) {
-    manager->DoConvertEncryptedValue(user);
-    if (ReadsPlainHomePageUser(manager)) manager->DoDecryptValue(user);
-    profile.SetVal("Profile", "HomePageUsername", user);
-  }
-  vxStringBase password = profile.GetVal("Profile", "HomePagePassword");
-  if (!password.isEmpty()) {
-    manager->DoConvertEncryptedValue(password);
-    profile.SetVal("Profile", "HomePagePassword", password);
-  }
+  ConvertProfileCredential(manager, profile, "HomePageUsername", ReadsPlainHomePageUser(manager));
+  ConvertProfileCredential(manager, profile, "HomePagePassword", false);
 }
 
 // Tradequill profiles that read a data warehouse name it as "warehouse:<data source>"; the OBX
