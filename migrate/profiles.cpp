@@ -52,22 +52,14 @@ int vxMigrationManager::CopyAllProfilesOfType(const vxStringBase& extension,
   std::string pattern = "*.";
   pattern.append(extension.str());
 
-  std::vector<vxStringBase> folders;
-  vxFileManager::GetFolderList(m_sourceDirectory, "", folders, 1, 0);
-  // The top folder is visited last, after every folder below it.
-  folders.emplace_back(std::string_view(&vxFileManager::m_slash, 1));
-
   const vxExclusionIndex excluded(*this, exclusions, vxStringBase::NullStr, 1);
   const bool copyDataFolders = CopiesProfileDataFolders();
-  for (const vxStringBase& folder : folders) {
-    vxStringBase sourceFolder;
-    vxFileManager::MakePath(sourceFolder, m_sourceDirectory, folder, 0);
-    if (sourceFolder.isEmpty()) continue;
+  vxStringBase sourceFolder;
+  vxFileInfoList files;
+  for (const vxStringBase& folder : vxListSourceFolders(*this)) {
+    if (!vxListSourceFiles(*this, folder, pattern.c_str(), sourceFolder, files)) continue;
     vxStringBase destinationFolder;
     vxFileManager::MakePath(destinationFolder, m_destinationDirectory, folder, 0);
-
-    vxFileInfoList files;
-    vxFileManager::GetFileList(sourceFolder, pattern.c_str(), files, 0);
     for (const vxFileInfo& file : files) {
       vxStringBase name = file.GetFilename().Filename();
       vxStringBase source;
