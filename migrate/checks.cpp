@@ -6,6 +6,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/manager.h"
 
@@ -70,6 +71,12 @@ int vxMigrationManager::DoCheckMigrateValidity() {
           m_destinationDirectory.c_str());
       return 1;
     }
+  }
+  // The texts may hide it: a link, "..", a bind mount. The real folders decide as well.
+  if (m_doors != nullptr && m_doors->DestinationInsideSource()) {
+    Log("Error: Destination directory cannot be child of source directory: ",
+        m_destinationDirectory.c_str());
+    return 1;
   }
   if (m_sourceProductID == -1) {
     Log("Error: Incorrect source product");

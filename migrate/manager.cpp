@@ -1,5 +1,6 @@
-// The manager's construction (command line, command file, executable, log header), its log, and
-// the run sequence: checks, plug-in search in sorted listing order, the install script, last line.
+// The manager's construction (command line, command file, executable, destination lock, doors, log
+// header), its log, and the run sequence: checks, plug-in search in sorted listing order, the
+// install script, last line.
 
 #include "migrate/manager.h"
 
@@ -13,9 +14,10 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
+#include "foundation/files/folder_lock.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/files/shared_lib.h"
 #include "foundation/inifile/ini_file.h"
-#include "foundation/string/tokenizer.h"
 #include "src/proc2/proc2.h"
 
 namespace {
@@ -42,6 +44,16 @@ bool PathExists(const vxStringBase& path) { return access(path.c_str(), F_OK) ==
 }  // namespace
 
 vxMigrationManager::vxMigrationManager(int argc, char** argv) {
+  FindExecutable();
+  Start(argc, argv);
+}
+
+vxMigrationManager::vxMigrationManager(int argc, char** argv, const vxStringBase& executable) {
+  m_executable = executable;
+  Start(argc, argv);
+}
+
+void vxMigrationManager::Start(int argc, char** argv) {
   m_cmdLineParser = new MigrationCmdLineParser(argc, argv);
   m_cmdLineParser->ParseCommand();
   if (!m_cmdLineParser->IsValid()) {
@@ -51,7 +63,6 @@ vxMigrationManager::vxMigrationManager(int argc, char** argv) {
 
   m_sourceDirectory = m_cmdLineParser->GetValue("D1");
   m_destinationDirectory = m_cmdLineParser->GetValue("D2");
-  FindExecutable(argc > 0 && argv != nullptr ? argv[0] : nullptr);
   m_sourceVersion = m_cmdLineParser->GetValue("V1");
   m_destinationVersion = m_cmdLineParser->GetValue("V2");
   m_sourceProduct = m_cmdLineParser->GetValue("P1");
@@ -60,11 +71,18 @@ vxMigrationManager::vxMigrationManager(int argc, char** argv) {
   m_destinationProductID = GetProductID(m_destinationProduct.c_str());
   m_sourceVersionDescriptor = new vxVersionDescriptor(m_sourceVersion);
   m_destinationVersionDescriptor = new vxVersionDescriptor(m_destinationVersion);
-  OpenLog();
+  // One run per destination at a time, decided before anything is written (the log included).
+  m_destinationLock = std::make_unique<vxFolderLock>();
+  if (m_destinationLock->Acquire(m_destinationDirectory) == vxFolderLock::kBusy) {
+    m_destinationBusy = true;
+    return;
+  }
+  OpenDoorsAndLog();
 }
 
 vxMigrationManager::~vxMigrationManager() {
   delete m_log;
+  m_doors.reset();
   delete m_sourceVersionDescriptor;
   delete m_destinationVersionDescriptor;
   delete m_cmdLineParser;
@@ -90,15 +108,19 @@ void vxMigrationManager::Log(const char* text, const char* value) {
 // the same name and its "profiles" keys become the "PF" options, present or not.
 void vxMigrationManager::ReadCommandFile() {
   const vxStringBase& cmd = m_cmdLineParser->GetValue("cmd");
-  vxStringBase moduleDirectory;
-  vxFileManager::GetModuleDirectory(moduleDirectory);
+  const vxStringBase moduleDirectory = vxFilename(m_executable).Directory();
+  const bool bareName =
+      cmd.find('\\') == vxStringBase::BadIndex && cmd.find('/') == vxStringBase::BadIndex;
+  // Without the executable's folder there is no command file beside it; the current folder is
+  // never taken in its place.
+  if (moduleDirectory.isEmpty() && (cmd.isEmpty() || bareName)) return;
   vxStringBase path;
   if (cmd.isEmpty()) {
     path = moduleDirectory;
     path.append(kCommandFileName);
   } else if (vxFilename::IsDirectory(cmd.c_str())) {
     path = JoinFolder(cmd, kCommandFileName);
-  } else if (cmd.find('\\') == vxStringBase::BadIndex && cmd.find('/') == vxStringBase::BadIndex) {
+  } else if (bareName) {
     path = moduleDirectory;
     path.append(cmd);
   } else {
@@ -124,37 +146,14 @@ void vxMigrationManager::ReadCommandFile() {
   m_cmdLineParser->Validate();
 }
 
-// The full path of the running program, found as a shell would from argv[0].
-void vxMigrationManager::FindExecutable(const char* programName) {
-  vxStringBase name(programName);
-  if (name.isEmpty()) return;
-  if (name.at(0) == '/') {
-    m_executable = vxFilename(name).Pathname();
-    return;
-  }
-  if (name.at(0) == '.' || name.find('/') != vxStringBase::BadIndex) {
-    if (name.at(0) != '.') name.prepend("./");
-    vxStringBase directory;
-    vxFileManager::GetCurrentDirectory(directory);
-    vxFileManager::MakePath(m_executable, directory, name, 1);
-    return;
-  }
-  const char* pathVariable = getenv("PATH");
-  if (pathVariable == nullptr) return;
-  vxBStringTokenizer tokenizer(vxStringBase(pathVariable), ":", true);
-  vxStringBase folder;
-  while (tokenizer.GetNext(folder)) {
-    vxStringBase candidate;
-    vxFileManager::MakePath(candidate, folder, name, 1);
-    vxFileInfo info{vxFilename(candidate)};
-    if (info.Exists() && (info.Mode() & 0100) != 0) {
-      m_executable = info.GetFilename().Pathname();
-      return;
-    }
-  }
-}
+// The running program as the kernel knows it: its real file, whatever name or link started it, so
+// an installed link to the host finds the plug-ins beside the real file. Empty when unknown.
+void vxMigrationManager::FindExecutable() { vxFileManager::GetModulePath(m_executable); }
 
-void vxMigrationManager::OpenLog() {
+void vxMigrationManager::OpenDoorsAndLog() {
+  m_doors = std::make_unique<vxRunDoors>(
+      m_sourceDirectory, m_destinationDirectory,
+      [this](const char* text, const char* path) { Log(text, path); });
   vxStringBase path;
   vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
   m_log = new vxLogFile(path, 1);
@@ -170,6 +169,7 @@ void vxMigrationManager::OpenLog() {
 }
 
 int vxMigrationManager::DoMigration() {
+  if (m_destinationBusy) return 1;
   int result = DoCheckMigrateValidity();
   if (result != 0) {
     Log(kPointerLine, m_log->GetFilename().c_str());
@@ -191,6 +191,11 @@ int vxMigrationManager::DoMigration() {
 void vxMigrationManager::RunPlugins(bool& found) {
   found = false;
   vxStringBase folder = vxFilename(m_executable).Directory();
+  if (folder.isEmpty()) {
+    // Never the current folder: any "*.so" where the tool was started would run.
+    Log("Error: The folder of the vxmigrate executable is unknown; no migration library loaded.");
+    return;
+  }
   vxFileInfoList plugins;
   vxFileManager::GetFileList(folder, "*.so", plugins, 1);
   vxMigrateInfo info;
@@ -250,7 +255,10 @@ void vxMigrationManager::RunInstallScript() {
   char previous[4095];
   bool havePrevious = getcwd(previous, sizeof previous) != nullptr;
   if (chdir(m_destinationDirectory.c_str()) != 0) {
-    // The script's outcome is not inspected; it simply runs from wherever we are.
+    // "./synchinstall.sh" anywhere else would be some other folder's script.
+    Log("Error: Unable to change to the destination folder; Synch Install Script not run: ",
+        m_destinationDirectory.c_str());
+    return;
   }
   std::string command = std::string("./") + kInstallScriptName;
   line = "Spawning Script: " + command;

@@ -13,6 +13,7 @@
 #define VXMIGRATE_MIGRATE_MANAGER_H_
 
 #include <cstdint>
+#include <memory>
 
 #include "foundation/files/log_file.h"
 #include "foundation/string/string_base.h"
@@ -31,6 +32,8 @@ struct vxMigrateInfo {
 };
 
 class vxMigrationManager;
+class vxFolderLock;
+class vxRunDoors;
 
 // The two entry points a migration plug-in exports with C linkage. Their results are ignored.
 extern "C" {
@@ -41,14 +44,22 @@ typedef int (*vxMigrateEntry)(vxMigrationManager* manager);
 class vxMigrationManager {
  public:
   // Builds the run from the host's arguments, falling back on "migcmd.ini" when the command line
-  // is incomplete. An incomplete run leaves IsValid() false and writes nothing anywhere.
+  // is incomplete. An incomplete run leaves IsValid() false and writes nothing anywhere. The run
+  // takes the destination folder's lock before it writes anything, and from then on every write
+  // and installation read passes the run's doors (foundation/files/run_doors.h). Plug-ins and
+  // "vxmigrate.ini" are looked for beside the running executable, as the kernel reports it.
   vxMigrationManager(int argc, char** argv);
+  // The same, for a host that keeps its plug-ins and "vxmigrate.ini" beside another executable
+  // path (an embedding program, the tests).
+  vxMigrationManager(int argc, char** argv, const vxStringBase& executable);
   virtual ~vxMigrationManager();
 
   vxMigrationManager(const vxMigrationManager&) = delete;
   vxMigrationManager& operator=(const vxMigrationManager&) = delete;
 
   bool IsValid() const;
+  // Another run holds the destination's lock: this run wrote nothing and DoMigration refuses.
+  bool IsDestinationBusy() const { return m_destinationBusy; }
   // REQUIRES: IsValid(). The whole run: checks, plug-in search and call, install script, last line.
   int DoMigration();
 
@@ -90,7 +101,7 @@ class vxMigrationManager {
   int DoCheckVersions(const vxStringBase& sourceSection, const vxStringBase& destinationSection);
   int DoBadMigration();
   bool IsInlineMigrate() const;
-  // Source folder text equals the destination folder text exactly.
+  // Source and destination are one folder: the same text, or two spellings of one folder.
   bool IsInPlaceMigrate() const;
   // The installation folder joined with a name relative to it ("\vantix.ini").
   vxStringBase GetFullSourceFilename(const char* name) const;
@@ -161,9 +172,10 @@ class vxMigrationManager {
   bool CopiesProfileDataFolders() const;
 
  private:
+  void Start(int argc, char** argv);
   void ReadCommandFile();
-  void FindExecutable(const char* programName);
-  void OpenLog();
+  void FindExecutable();
+  void OpenDoorsAndLog();
   void RunPlugins(bool& found);
   void RunInstallScript();
 
@@ -180,6 +192,9 @@ class vxMigrationManager {
   vxVersionDescriptor* m_destinationVersionDescriptor = nullptr;
   vxLogFile* m_log = nullptr;
   MigrationCmdLineParser* m_cmdLineParser = nullptr;
+  std::unique_ptr<vxFolderLock> m_destinationLock;
+  std::unique_ptr<vxRunDoors> m_doors;
+  bool m_destinationBusy = false;
 };
 
 #endif  // VXMIGRATE_MIGRATE_MANAGER_H_

@@ -16,6 +16,7 @@
 #include <string>
 
 #include "foundation/files/dir_entries.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/files/temp_file.h"
 #include "foundation/files/write_all.h"
 
@@ -75,9 +76,11 @@ int vxBasicFile::Open() {
   int access = flags & O_ACCMODE;
   mode_t permissions = permissions_ != 0 ? static_cast<mode_t>(permissions_) : 0666;
   if ((flags & O_TRUNC) && access != O_RDONLY) {
+    if (!vxfiles::MayWrite(name_)) return 1;
     fd_ = OpenRewrite(name_, flags, permissions, tempName_);
     return fd_ >= 0 ? 0 : 1;
   }
+  if (!vxfiles::MayRead(name_) || (access != O_RDONLY && !vxfiles::MayWrite(name_))) return 1;
   // Non-blocking until it is known to be a regular file: opening a pipe for reading would wait
   // for a writer, and reading a pipe or a device might never end.
   fd_ = open(name_.c_str(), flags | O_NONBLOCK, permissions);

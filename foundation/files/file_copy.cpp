@@ -1,7 +1,8 @@
 // Copies of one file, of a folder's whole tree, and of a "folder/pattern" set. Each file is written
 // to a hidden temporary name beside its destination and renamed into place once complete, so a
 // destination name never shows a partial file; an existing destination is replaced only when the
-// caller asks. Symbolic links in the source are copied as links and never followed.
+// caller asks. Symbolic links in the source are copied as links and never followed. Every folder
+// written into and every file or folder read by name passes the run's doors first.
 
 #ifndef _FILE_OFFSET_BITS
 #define _FILE_OFFSET_BITS 64
@@ -20,6 +21,7 @@
 #include <vector>
 
 #include "foundation/files/dir_entries.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/files/temp_file.h"
 #include "foundation/files/write_all.h"
 
@@ -51,6 +53,7 @@ struct CopyJob {
   bool failed = false;
   bool hasDestRoot = false;
   FolderId destRoot;
+  std::string destPath;  // the destination folder being filled, for the doors
   std::vector<char> copyBuffer;
   std::vector<char> dirBuffer;
   std::vector<FolderId> openFolders;  // source folders on the current descent
@@ -231,12 +234,19 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
     close(srcFd);
     return;
   }
+  const size_t parentPathSize = job.destPath.size();
+  job.destPath.append("/").append(name);
   // Made private while it fills (a read-only source folder must not lock us out of its copy);
   // its own mode and times follow once it is complete.
   bool fresh = mkdirat(dstParent, name, 0700) == 0;
-  // An existing destination folder may be a link to one elsewhere; writing there is wanted.
-  int dstFd = (fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder) : -1;
+  int dstFd = (fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder | O_NOFOLLOW) : -1;
+  // An existing destination folder that is a link is written through only when it leads to a
+  // folder inside the destination installation.
+  if (dstFd < 0 && errno == ELOOP && vxfiles::MayWriteInto(job.destPath)) {
+    dstFd = openat(dstParent, name, kOpenFolder);
+  }
   if (dstFd < 0) {
+    job.destPath.resize(parentPathSize);
     close(srcFd);
     job.failed = true;
     return;
@@ -244,6 +254,7 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   job.openFolders.push_back(id);
   CopyFolderContents(job, srcFd, dstFd, fresh, depth);
   job.openFolders.pop_back();
+  job.destPath.resize(parentPathSize);
   if (fresh) StampFolder(dstFd, st);
   close(dstFd);
   close(srcFd);
@@ -277,6 +288,8 @@ std::string TrimFolder(const std::string& path) {
 // Opens the destination folder, creating it and its parents when missing. fresh tells whether
 // this call made the folder itself.
 int OpenDestinationFolder(const std::string& path, bool& fresh) {
+  fresh = false;
+  if (!vxfiles::MayWriteInto(path)) return -1;
   std::string folder = TrimFolder(path);
   fresh = mkdir(folder.c_str(), 0777) == 0;
   if (!fresh && errno == ENOENT) {
@@ -311,6 +324,7 @@ int CopySingleFile(CopyJob& job, const std::string& from, const std::string& to)
 // The entries of folder whose names match pattern, not descending, into the folder to.
 int CopyMatchingFiles(CopyJob& job, const std::string& folder, const std::string& pattern,
                       const std::string& to) {
+  if (!vxfiles::MayRead(folder)) return 1;
   int srcFd = open(folder.c_str(), kOpenFolder);
   if (srcFd < 0) return 1;
   std::vector<vxfiles::DirEntry> entries;
@@ -338,6 +352,7 @@ int CopyMatchingFiles(CopyJob& job, const std::string& folder, const std::string
 
 // tree 1: a folder's whole tree, a "folder/pattern" set, or a single file, into the folder to.
 int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to) {
+  if (!vxfiles::MayRead(from)) return 1;
   int srcFd = open(from.c_str(), kOpenFolder);
   if (srcFd < 0) {
     int error = errno;
@@ -367,6 +382,7 @@ int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to)
   FolderId srcId(st.st_dev, st.st_ino);
   job.destRoot = IdOf(dstFd);
   job.hasDestRoot = true;
+  job.destPath = TrimFolder(to);
   if (job.destRoot != srcId) {
     job.openFolders.push_back(srcId);
     CopyFolderContents(job, srcFd, dstFd, fresh, 0);
@@ -388,6 +404,7 @@ int vxFileManager::CopyFile(const vxStringBase& from, const vxStringBase& to, un
   job.replace = replace != 0;
   job.newerOnly = newerOnly != 0;
   if (tree != 0) return CopyIntoFolder(job, from.str(), to.str());
+  if (!vxfiles::MayRead(from.view()) || !vxfiles::MayWrite(to.view())) return 1;
   return CopySingleFile(job, from.str(), to.str());
 }
 

@@ -65,7 +65,9 @@ class vxFileManager {
   static int CreateDirectory(const vxStringBase& path, const void* attributes);
   // The process's current folder (empty when it cannot be read).
   static void GetCurrentDirectory(vxStringBase& result);
-  // The folder of the running program, ending in a separator.
+  // The running program's real file as the kernel reports it (empty when it cannot be read).
+  static void GetModulePath(vxStringBase& result);
+  // The folder of the running program, ending in a separator (empty when unknown).
   static void GetModuleDirectory(vxStringBase& result);
   // True when something (file, folder, link) is at path.
   static bool Exists(const vxStringBase& path);

@@ -16,6 +16,8 @@
 #include <string_view>
 #include <vector>
 
+#include "foundation/files/run_doors.h"
+
 const char vxFileManager::m_slash = '/';
 
 namespace {
@@ -75,14 +77,14 @@ void vxFileManager::MakePath(vxStringBase& result, const vxStringBase& folder,
 }
 
 int vxFileManager::DeleteFile(const vxStringBase& path, unsigned int missingIsSuccess) {
-  if (path.isEmpty()) return 1;
+  if (path.isEmpty() || !vxfiles::MayWrite(path.view())) return 1;
   if (unlink(path.c_str()) == 0) return 0;
   return (errno == ENOENT && missingIsSuccess != 0) ? 0 : 1;
 }
 
 int vxFileManager::CreateDirectory(const vxStringBase& path, const void* /*attributes*/) {
   std::string folder = FolderPart(path.view());
-  if (folder.empty()) return 1;
+  if (folder.empty() || !vxfiles::MayWriteInto(path.view())) return 1;
   if (mkdir(folder.c_str(), 0777) != 0 && errno == ENOENT) {
     // Parents first. Failures are not looked at here: the final test says whether it worked.
     for (size_t slash = folder.find('/', 1); slash != std::string::npos;
@@ -101,6 +103,12 @@ void vxFileManager::GetCurrentDirectory(vxStringBase& result) {
 }
 
 void vxFileManager::GetModuleDirectory(vxStringBase& result) {
+  vxStringBase path;
+  GetModulePath(path);
+  result = path.isEmpty() ? vxStringBase() : vxFilename(path).Directory();
+}
+
+void vxFileManager::GetModulePath(vxStringBase& result) {
   std::vector<char> buffer(4096);
   for (;;) {
     ssize_t n = readlink("/proc/self/exe", buffer.data(), buffer.size());
@@ -109,8 +117,7 @@ void vxFileManager::GetModuleDirectory(vxStringBase& result) {
       return;
     }
     if (static_cast<size_t>(n) < buffer.size()) {
-      vxFilename exe(vxStringBase(buffer.data(), static_cast<size_t>(n)));
-      result = exe.Directory();
+      result = vxStringBase(buffer.data(), static_cast<size_t>(n));
       return;
     }
     if (buffer.size() >= (1u << 20)) {  // no path is that long; stop rather than grow forever

@@ -12,6 +12,7 @@
 #include <ctime>
 #include <string>
 
+#include "foundation/files/run_doors.h"
 #include "foundation/files/write_all.h"
 
 namespace {
@@ -28,6 +29,7 @@ std::string TimeStamp() {
 
 vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
   int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
+  if (!vxfiles::MayWrite(filename_.view())) return;  // no log where the run may not write
   // A link where the log belongs is removed, never followed: it could point into the source
   // installation, which the run must not change.
   struct stat st;

@@ -14,6 +14,7 @@
 #include <cstdint>
 #include <vector>
 
+#include "foundation/files/run_doors.h"
 #include "foundation/files/write_all.h"
 
 namespace vxini {
@@ -50,6 +51,7 @@ bool SyncFolder(const std::string& folder) {
 
 bool ReadWholeFile(const std::string& path, std::string* text) {
   text->clear();
+  if (!vxfiles::MayRead(path)) return false;
   // Non-blocking, so that a pipe given as a settings file cannot stall the run before the check.
   int fd = open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NOCTTY | O_NONBLOCK);
   if (fd < 0) return false;
@@ -124,6 +126,7 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
   Abandon();
   target_ = target;
   failed_ = false;
+  if (!vxfiles::MayWrite(target.path)) return false;
   std::string folder = FolderOf(target.path);
   size_t slash = target.path.rfind('/');
   std::string base = slash == std::string::npos ? target.path : target.path.substr(slash + 1);

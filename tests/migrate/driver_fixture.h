@@ -12,11 +12,13 @@
 
 namespace vxtest {
 
+// A manager over args, whose executable (plug-ins, "vxmigrate.ini") is args[0].
 inline std::unique_ptr<vxMigrationManager> MakeManager(std::vector<std::string> args) {
   std::vector<char*> argv;
   for (std::string& arg : args) argv.push_back(&arg[0]);
   argv.push_back(nullptr);
-  return std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
+  return std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data(),
+                                              vxStringBase(args[0].c_str()));
 }
 
 // A manager for products p1 -> p2, versions v1 -> v2, whose executable is "<root>/bin/vxmigrate".

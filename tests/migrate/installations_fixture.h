@@ -90,7 +90,8 @@ class Installations {
     std::vector<char*> argv;
     for (std::string& arg : args) argv.push_back(&arg[0]);
     argv.push_back(nullptr);
-    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data());
+    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data(),
+                                                    vxStringBase(args[0].c_str()));
     EXPECT_TRUE(manager_->IsValid());
     headerEntries_ = LogEntries(Dst("vxmigrate.log")).size();
     return *manager_;

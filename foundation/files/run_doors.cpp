@@ -1,0 +1,257 @@
+// The run's doors: real paths resolved once, folders compared by device and inode, and a memo of
+// which installation each real folder lies in, so that thousands of writes into a few folders cost
+// one path resolution each and no walk to the root.
+
+#include "foundation/files/run_doors.h"
+
+#include <errno.h>
+#include <stdlib.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <string_view>
+#include <vector>
+
+#include "foundation/files/file_manager.h"
+
+namespace {
+
+vxRunDoors* g_current = nullptr;
+
+// An absolute text for path, with runs of separators collapsed and the closing ones dropped; ".."
+// and links are left for the kernel to resolve. Relative paths start at the current folder.
+std::string AbsoluteText(std::string_view path) {
+  std::string text;
+  if (path.empty()) return text;
+  if (path[0] != '/') {
+    char* cwd = getcwd(nullptr, 0);
+    if (cwd != nullptr) text = cwd;
+    free(cwd);
+  }
+  text.push_back('/');
+  for (char c : path) {
+    if (c == '/' && text.back() == '/') continue;
+    text.push_back(c);
+  }
+  while (text.size() > 1 && text.back() == '/') text.pop_back();
+  return text;
+}
+
+// The folder that holds path ("/a/b" -> "/a", "/a" -> "/"); path is absolute.
+std::string ParentOf(const std::string& path) {
+  size_t slash = path.rfind('/');
+  return slash == 0 || slash == std::string::npos ? "/" : path.substr(0, slash);
+}
+
+std::string LastPart(const std::string& path) {
+  size_t slash = path.rfind('/');
+  return slash == std::string::npos ? path : path.substr(slash + 1);
+}
+
+bool RealPath(const std::string& path, std::string& real) {
+  char* resolved = realpath(path.c_str(), nullptr);
+  if (resolved == nullptr) return false;
+  real = resolved;
+  free(resolved);
+  return true;
+}
+
+// The real path of an absolute folder, where folders at its end that do not exist yet count as
+// made inside the last one that does. False when a part exists but cannot be resolved (a link that
+// leads nowhere, a loop, a file on the way) or a missing part is "." or "..".
+bool ResolveFolder(std::string folder, std::string& real) {
+  for (;;) {
+    if (RealPath(folder, real)) return true;
+    struct stat st;
+    if (errno != ENOENT || lstat(folder.c_str(), &st) == 0 || errno != ENOENT) return false;
+    const std::string last = LastPart(folder);
+    if (last == "." || last == "..") return false;
+    folder = ParentOf(folder);
+  }
+}
+
+bool StartsWithFolder(const std::string& path, const std::string& folder) {
+  if (folder.empty() || path.compare(0, folder.size(), folder) != 0) return false;
+  return path.size() == folder.size() || path[folder.size()] == '/' || folder == "/";
+}
+
+}  // namespace
+
+vxRunDoors::vxRunDoors(const vxStringBase& source, const vxStringBase& destination,
+                       Reporter reporter)
+    : reporter_(std::move(reporter)),
+      sourceText_(AbsoluteText(source.view())),
+      destinationText_(AbsoluteText(destination.view())) {
+  struct stat st;
+  if (!sourceText_.empty() && RealPath(sourceText_, sourceReal_) &&
+      stat(sourceReal_.c_str(), &st) == 0 && S_ISDIR(st.st_mode)) {
+    source_ = {st.st_dev, st.st_ino, true};
+  }
+  if (!destinationText_.empty() && RealPath(destinationText_, destinationReal_) &&
+      stat(destinationReal_.c_str(), &st) == 0 && S_ISDIR(st.st_mode)) {
+    destination_ = {st.st_dev, st.st_ino, true};
+  }
+  inPlace_ = source_.known && destination_.known && source_.dev == destination_.dev &&
+             source_.ino == destination_.ino;
+  if (source_.known && destination_.known && !inPlace_) {
+    for (std::string walk = destinationReal_; walk != "/";) {
+      walk = ParentOf(walk);
+      if (stat(walk.c_str(), &st) == 0 && st.st_dev == source_.dev && st.st_ino == source_.ino) {
+        destinationInsideSource_ = true;
+        break;
+      }
+    }
+  }
+  previous_ = g_current;
+  g_current = this;
+}
+
+vxRunDoors::~vxRunDoors() {
+  if (g_current == this) g_current = previous_;
+}
+
+vxRunDoors* vxRunDoors::Current() { return g_current; }
+
+void vxRunDoors::Refuse(const char* text, std::string_view path) const {
+  if (reporter_) reporter_(text, std::string(path).c_str());
+}
+
+// Walks up from a real folder until an installation folder is met. The destination is looked for
+// first, so an in-place run (one folder) counts as writing its destination.
+vxRunDoors::Within vxRunDoors::Locate(const std::string& realFolder) {
+  auto known = located_.find(realFolder);
+  if (known != located_.end()) return known->second;
+  Within within = Within::kNeither;
+  struct stat st;
+  if (stat(realFolder.c_str(), &st) == 0) {
+    if (destination_.known && st.st_dev == destination_.dev && st.st_ino == destination_.ino) {
+      within = Within::kDestination;
+    } else if (source_.known && st.st_dev == source_.dev && st.st_ino == source_.ino) {
+      within = Within::kSource;
+    } else if (realFolder != "/") {
+      within = Locate(ParentOf(realFolder));
+    }
+  }
+  located_.emplace(realFolder, within);
+  return within;
+}
+
+bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view path) {
+  if (!destination_.known) {
+    Refuse("Error: No destination installation to write in: ", path);
+    return false;
+  }
+  if (destinationInsideSource_) {
+    Refuse("Error: Refused to write inside the source installation: ", path);
+    return false;
+  }
+  std::string real;
+  if (!ResolveFolder(folder, real)) {
+    Refuse("Error: Refused to write through a link that leads nowhere: ", path);
+    return false;
+  }
+  switch (Locate(real)) {
+    case Within::kDestination:
+      return true;
+    case Within::kSource:
+      Refuse("Error: Refused to write inside the source installation: ", path);
+      return false;
+    case Within::kNeither:
+      break;
+  }
+  Refuse("Error: Refused to write outside the destination installation: ", path);
+  return false;
+}
+
+bool vxRunDoors::AdmitWrite(std::string_view path) {
+  const std::string text = AbsoluteText(path);
+  const std::string last = LastPart(text);
+  if (text.empty() || text == "/" || last == "." || last == "..") {
+    Refuse("Error: Refused to write an entry without a name: ", path);
+    return false;
+  }
+  return AdmitWriteBelow(ParentOf(text), path);
+}
+
+bool vxRunDoors::AdmitWriteInto(std::string_view folder) {
+  const std::string text = AbsoluteText(folder);
+  if (text.empty()) {
+    Refuse("Error: Refused to write an entry without a name: ", folder);
+    return false;
+  }
+  return AdmitWriteBelow(text, folder);
+}
+
+bool vxRunDoors::IsInstallationText(const std::string& path) const {
+  for (const std::string* folder :
+       {&sourceText_, &destinationText_, &sourceReal_, &destinationReal_}) {
+    if (StartsWithFolder(path, *folder)) return true;
+  }
+  return false;
+}
+
+bool vxRunDoors::AdmitRead(std::string_view path) {
+  const std::string text = AbsoluteText(path);
+  std::string real;
+  if (!IsInstallationText(text) || !RealPath(text, real)) return true;
+  struct stat st;
+  if (stat(real.c_str(), &st) != 0) return true;
+  const bool isRoot = (source_.known && st.st_dev == source_.dev && st.st_ino == source_.ino) ||
+                      (destination_.known && st.st_dev == destination_.dev &&
+                       st.st_ino == destination_.ino);
+  if (isRoot || Locate(S_ISDIR(st.st_mode) ? real : ParentOf(real)) != Within::kNeither) {
+    return true;
+  }
+  Refuse("Error: Refused to read a file that leads outside the installations: ", path);
+  return false;
+}
+
+bool vxRunDoors::JoinBeneath(vxStringBase& result, const vxStringBase& folder,
+                             const vxStringBase& name, unsigned int isFile) {
+  std::vector<std::string_view> parts;
+  std::string_view rest = name.view();
+  while (!rest.empty()) {
+    size_t end = rest.find_first_of("/\\");
+    std::string_view part = rest.substr(0, end);
+    rest = end == std::string_view::npos ? std::string_view() : rest.substr(end + 1);
+    if (part.empty() || part == ".") continue;
+    if (part != "..") {
+      parts.push_back(part);
+    } else if (!parts.empty()) {
+      parts.pop_back();
+    } else {
+      if (g_current != nullptr) {
+        g_current->Refuse("Error: Refused a folder name that climbs out of its installation: ",
+                          name.view());
+      }
+      result.makeNull();
+      return false;
+    }
+  }
+  std::string joined;
+  for (std::string_view part : parts) {
+    if (!joined.empty()) joined.push_back('/');
+    joined.append(part);
+  }
+  vxFileManager::MakePath(result, folder, vxStringBase(std::string_view(joined)), isFile);
+  return true;
+}
+
+namespace vxfiles {
+
+bool MayWrite(std::string_view path) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  return doors == nullptr || doors->AdmitWrite(path);
+}
+
+bool MayWriteInto(std::string_view folder) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  return doors == nullptr || doors->AdmitWriteInto(folder);
+}
+
+bool MayRead(std::string_view path) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  return doors == nullptr || doors->AdmitRead(path);
+}
+
+}  // namespace vxfiles
