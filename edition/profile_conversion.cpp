@@ -12,6 +12,7 @@
 #include "edition/halden_to_obx.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/profile_migration.h"
@@ -292,7 +293,7 @@ int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
   if (profilesDir.isEmpty()) return 0;
 
   vxStringBase destinationProfiles;
-  vxFileManager::MakePath(destinationProfiles, destinationFolder_, profilesDir, 0);
+  if (!vxRunDoors::JoinBeneath(destinationProfiles, destinationFolder_, profilesDir, 0)) return 1;
   vxStringBase sourceProfiles;
   vxFileManager::MakePath(sourceProfiles, sourceFolder_, kProfileFolder, 0);
   vxFileInfoList profiles;

@@ -33,6 +33,13 @@ int main(int argc, char** argv) {
     fputs(kUsage, stderr);
     return 1;
   }
+  if (manager.IsDestinationBusy()) {
+    fprintf(stderr,
+            "vxmigrate: another run is migrating into %s; nothing was written. Try again when it "
+            "has finished.\n",
+            manager.GetDestinationDirectory().c_str());
+    return 5;
+  }
   int result = manager.DoMigration();
   const vxLogFile* log = manager.GetLog();
   if (log->IsOpen()) {

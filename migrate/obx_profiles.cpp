@@ -7,6 +7,7 @@
 
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/internal/exclusion_index.h"
 #include "migrate/internal/resolved_path.h"
@@ -72,8 +73,10 @@ int vxMigrationManager::DoCopyOBXProfiles() {
   const vxStringBase profilesDir = sourceSettings.GetVal("defaults", "profilesdir");
   if (!IsInstallationProfileFolder(profilesDir)) return 0;
   vxStringBase sourceProfiles;
-  vxFileManager::MakePath(sourceProfiles, m_sourceDirectory,
-                          profilesDir.isEmpty() ? vxStringBase(kProfiles) : profilesDir, 0);
+  if (!vxRunDoors::JoinBeneath(sourceProfiles, m_sourceDirectory,
+                               profilesDir.isEmpty() ? vxStringBase(kProfiles) : profilesDir, 0)) {
+    return 1;
+  }
 
   vxFileInfoList profiles;
   vxFileManager::GetFileList(sourceProfiles, "*.wlp", profiles, 0);

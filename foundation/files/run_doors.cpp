@@ -106,8 +106,11 @@ vxRunDoors::vxRunDoors(const vxStringBase& source, const vxStringBase& destinati
   g_current = this;
 }
 
+// Doors usually close in the reverse order of opening; any other order still unlinks these.
 vxRunDoors::~vxRunDoors() {
-  if (g_current == this) g_current = previous_;
+  vxRunDoors** link = &g_current;
+  while (*link != nullptr && *link != this) link = &(*link)->previous_;
+  if (*link == this) *link = previous_;
 }
 
 vxRunDoors* vxRunDoors::Current() { return g_current; }
@@ -147,7 +150,7 @@ bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view pat
   }
   std::string real;
   if (!ResolveFolder(folder, real)) {
-    Refuse("Error: Refused to write through a link that leads nowhere: ", path);
+    Refuse("Error: Refused to write where the path cannot be followed: ", path);
     return false;
   }
   switch (Locate(real)) {
