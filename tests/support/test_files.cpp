@@ -103,6 +103,25 @@ std::vector<std::string> ListTree(const std::string& folder) {
   return names;
 }
 
+std::map<std::string, std::string> TreeState(const std::string& folder) {
+  std::map<std::string, std::string> state;
+  for (const std::string& name : ListTree(folder)) {
+    const std::string path = folder + "/" + name;
+    struct stat st;
+    if (lstat(path.c_str(), &st) != 0) continue;
+    char mode[16];
+    snprintf(mode, sizeof mode, "%04o ", st.st_mode & 07777);
+    if (S_ISLNK(st.st_mode)) {
+      char target[4096];
+      const ssize_t length = readlink(path.c_str(), target, sizeof target);
+      state[name] = "-> " + std::string(target, length > 0 ? static_cast<size_t>(length) : 0);
+    } else {
+      state[name] = mode + (S_ISDIR(st.st_mode) ? std::string("folder") : ReadFile(path));
+    }
+  }
+  return state;
+}
+
 std::vector<std::string> LogEntries(const std::string& logPath) {
   std::vector<std::string> entries;
   std::ifstream in(logPath, std::ios::binary);

@@ -4,6 +4,7 @@
 #ifndef VXMIGRATE_TESTS_SUPPORT_TEST_FILES_H_
 #define VXMIGRATE_TESTS_SUPPORT_TEST_FILES_H_
 
+#include <map>
 #include <string>
 #include <vector>
 
@@ -33,6 +34,9 @@ bool FileExists(const std::string& path);
 void MakeDirs(const std::string& path);
 // Names (not paths) of every entry below folder, relative to it, sorted: "a", "a/b.ini", ...
 std::vector<std::string> ListTree(const std::string& folder);
+// Every entry below folder with what it holds, to compare a whole tree before and after: a file's
+// mode and bytes, a folder's mode, a link's target.
+std::map<std::string, std::string> TreeState(const std::string& folder);
 // The lines of a log file with their time stamps removed ("YYYY-MM-DD HH:MM:SS  " prefix).
 std::vector<std::string> LogEntries(const std::string& logPath);
 
