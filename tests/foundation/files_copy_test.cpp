@@ -11,6 +11,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "support/test_files.h"
+#include "support/unprivileged.h"
 
 namespace {
 
@@ -131,13 +132,14 @@ TEST(CopyFile, TreeCopyKeepsExistingFilesAndGoesOnAfterAFailure) {
 }
 
 TEST(CopyFile, UnreadableSourceLeavesNoPartialFile) {
-  if (geteuid() == 0) GTEST_SKIP() << "root reads unreadable files";
   vxtest::TempDir tmp;
   WriteFiles(tmp.Path("src"), {"secret.ini", "open.ini"});
-  ASSERT_EQ(0, chmod(tmp.Path("src/secret.ini").c_str(), 0));
-  EXPECT_EQ(1, Copy(tmp.Path("src/secret.ini"), tmp.Path("dst/secret.ini"), 0, 1));
-  EXPECT_EQ(1, Copy(tmp.Path("src"), tmp.Path("dst"), 1, 1));
-  EXPECT_EQ((Names{"open.ini"}), ListTree(tmp.Path("dst")));
+  EXPECT_TRUE(vxtest::AsUnprivilegedUser({tmp.path()}, [&tmp] {
+    ASSERT_EQ(0, chmod(tmp.Path("src/secret.ini").c_str(), 0));
+    EXPECT_EQ(1, Copy(tmp.Path("src/secret.ini"), tmp.Path("dst/secret.ini"), 0, 1));
+    EXPECT_EQ(1, Copy(tmp.Path("src"), tmp.Path("dst"), 1, 1));
+    EXPECT_EQ((Names{"open.ini"}), ListTree(tmp.Path("dst")));
+  }));
 }
 
 }  // namespace

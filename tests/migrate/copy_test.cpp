@@ -15,6 +15,7 @@
 
 #include "migrate/installations_fixture.h"
 #include "migrate/sample_lists.h"
+#include "support/unprivileged.h"
 
 namespace vxtest {
 namespace {
@@ -128,27 +129,30 @@ TEST(CopyAllFilesOfType, CopiesSubfoldersFirstNeverReplacesAndSkipsExcludedFiles
 
 // A pattern copy answers for the whole set, so the files that did not arrive are named one by one.
 TEST(CopyOperations, AnUnreadableEntryCostsOneLineAndTheRestIsCopied) {
-  if (geteuid() == 0) GTEST_SKIP() << "root reads every file";
   Installations run;
   run.WriteSources({"a.wlp", "no.wlp", "dir/in.wlp", "z/z.wlp", "t/a.mss", "t/no.mss",
                     "top.mss", "no.mss", "kept.mss"});
   WriteFile(run.Dst("kept.mss"), "kept");
-  for (const char* name : {"no.wlp", "dir", "t/no.mss", "no.mss"}) chmod(run.Src(name).c_str(), 0);
-  run.manager().CopyAllFilesOfType("wlp", vxStringBase::NullStr);
-  run.manager().CopyFiles("no.wlp,a.wlp", 0);
-  EXPECT_EQ(1, run.manager().CopyFilesInRelativeFolder("t", "mss", 0));
-  EXPECT_EQ(1, run.manager().CopyFilesOfType("mss", 0));
-  chmod(run.Src("dir").c_str(), 0755);
+  EXPECT_TRUE(AsUnprivilegedUser({run.Root()}, [&run] {
+    for (const char* name : {"no.wlp", "dir", "t/no.mss", "no.mss"}) {
+      chmod(run.Src(name).c_str(), 0);
+    }
+    run.manager().CopyAllFilesOfType("wlp", vxStringBase::NullStr);
+    run.manager().CopyFiles("no.wlp,a.wlp", 0);
+    EXPECT_EQ(1, run.manager().CopyFilesInRelativeFolder("t", "mss", 0));
+    EXPECT_EQ(1, run.manager().CopyFilesOfType("mss", 0));
+    chmod(run.Src("dir").c_str(), 0755);
 
-  EXPECT_EQ((Entries{"Error: Unable to read folder:  <src>/dir/", "File copied:  <src>/z/z.wlp",
-                     "File copied:  <src>/a.wlp", "Error: Unable to copy file:  <src>/no.wlp",
-                     "Error: Unable to copy file:  <src>/no.wlp", "File copied: <src>/a.wlp",
-                     "Files copied from folder:  <src>/t/*.mss",
-                     "Error: Unable to copy file:  <src>/t/no.mss",
-                     "Error: Unable to copy file:  <src>/no.mss"}),
-            run.RunLog());
-  EXPECT_EQ((Entries{"a.wlp", "kept.mss", "t", "t/a.mss", "top.mss", "z", "z/z.wlp"}),
-            run.DestinationTree());
+    EXPECT_EQ((Entries{"Error: Unable to read folder:  <src>/dir/", "File copied:  <src>/z/z.wlp",
+                       "File copied:  <src>/a.wlp", "Error: Unable to copy file:  <src>/no.wlp",
+                       "Error: Unable to copy file:  <src>/no.wlp", "File copied: <src>/a.wlp",
+                       "Files copied from folder:  <src>/t/*.mss",
+                       "Error: Unable to copy file:  <src>/t/no.mss",
+                       "Error: Unable to copy file:  <src>/no.mss"}),
+              run.RunLog());
+    EXPECT_EQ((Entries{"a.wlp", "kept.mss", "t", "t/a.mss", "top.mss", "z", "z/z.wlp"}),
+              run.DestinationTree());
+  }));
 }
 
 // Named files, the top folder's files of a type and one folder's files replace what is there,

@@ -8,6 +8,7 @@
 #include <string>
 
 #include "migrate/installations_fixture.h"
+#include "support/unprivileged.h"
 
 namespace vxtest {
 namespace {
@@ -42,22 +43,30 @@ TEST(MergeINIFiles, KeepsDestinationValuesAddsTheOldOnesAndCopiesIntoAMissingDes
 TEST(MergeINIFiles, AnUnloadableFileOnEitherSideIsReportedAndNothingIsWritten) {
   for (const auto& [destinationSide, mode] :
        {std::make_pair(true, 0644), {true, 0}, {false, 0644}, {false, 0}}) {
-    if (mode == 0 && geteuid() == 0) continue;  // root reads every file
     Installations run;
-    const std::string bad = destinationSide ? run.Dst("c.ini") : run.Src("c.ini");
-    const std::string good = destinationSide ? run.Src("c.ini") : run.Dst("c.ini");
-    const std::string content = mode == 0 ? "[a]\nk=v\n"
-                                : destinationSide ? std::string("[a]\nk=\0v\n", 9)
-                                                  : std::string("\x7f" "ELF\0\0\0", 7);
-    WriteFile(bad, content);
-    WriteFile(good, kNew);
-    chmod(bad.c_str(), static_cast<mode_t>(mode));
-    EXPECT_EQ(1, run.manager().MergeINIFiles(run.Src("c.ini").c_str(), run.Dst("c.ini").c_str()));
-    chmod(bad.c_str(), 0644);
-    EXPECT_EQ((Entries{"Error: Unable to open file:   " + run.Marked(bad)}), run.RunLog());
-    EXPECT_EQ((Entries{content, kNew}), (Entries{ReadFile(bad), ReadFile(good)}));
-    EXPECT_EQ((Entries{"c.ini"}), run.DestinationTree());
-    EXPECT_EQ((Entries{"c.ini"}), ListTree(run.Src()));
+    // An unreadable file needs a user who cannot read it: root reads every file.
+    const auto check = [&, destinationSide = destinationSide, mode = mode] {
+      const std::string bad = destinationSide ? run.Dst("c.ini") : run.Src("c.ini");
+      const std::string good = destinationSide ? run.Src("c.ini") : run.Dst("c.ini");
+      const std::string content = mode == 0 ? "[a]\nk=v\n"
+                                  : destinationSide ? std::string("[a]\nk=\0v\n", 9)
+                                                    : std::string("\x7f" "ELF\0\0\0", 7);
+      WriteFile(bad, content);
+      WriteFile(good, kNew);
+      chmod(bad.c_str(), static_cast<mode_t>(mode));
+      EXPECT_EQ(1,
+                run.manager().MergeINIFiles(run.Src("c.ini").c_str(), run.Dst("c.ini").c_str()));
+      chmod(bad.c_str(), 0644);
+      EXPECT_EQ((Entries{"Error: Unable to open file:   " + run.Marked(bad)}), run.RunLog());
+      EXPECT_EQ((Entries{content, kNew}), (Entries{ReadFile(bad), ReadFile(good)}));
+      EXPECT_EQ((Entries{"c.ini"}), run.DestinationTree());
+      EXPECT_EQ((Entries{"c.ini"}), ListTree(run.Src()));
+    };
+    if (mode == 0) {
+      EXPECT_TRUE(AsUnprivilegedUser({run.Root()}, check));
+    } else {
+      check();
+    }
   }
 }
 

@@ -39,6 +39,8 @@ class Installations {
   Installations(const Installations&) = delete;
   Installations& operator=(const Installations&) = delete;
 
+  // The folder holding both installations (and "bin").
+  std::string Root() const { return root_.path(); }
   // Paths inside the two installations ("" for the installation folder itself).
   std::string Src(const std::string& rel = "") const { return Join("src", rel); }
   std::string Dst(const std::string& rel = "") const { return Join(inPlace_ ? "src" : "dst", rel); }
