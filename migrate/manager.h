@@ -13,11 +13,13 @@
 #define VXMIGRATE_MIGRATE_MANAGER_H_
 
 #include <cstdint>
+#include <string>
 
 #include "foundation/files/log_file.h"
 #include "foundation/string/string_base.h"
 #include "foundation/string/version.h"
 #include "migrate/cmdline_parser.h"
+#include "migrate/run_report.h"
 
 // What a plug-in's "MigrateInitialize" fills in: the pair of products it migrates between, and four
 // further texts for its own use (emptied before the call, never read by the run).
@@ -56,6 +58,15 @@ class vxMigrationManager {
   void Log(const char* text);
   // text immediately followed by value, as one entry.
   void Log(const char* text, const char* value);
+  // A failed step whose log text is fixed to say nothing: counted as an error and told to the
+  // listener, never written to the log. text is followed directly by value (a file's path).
+  void ReportUnloggedFailure(const char* text, const char* value);
+
+  // The host's view of the run. The listener is told the entries already written (the header)
+  // at once, then each entry as it is logged; it is not owned and must outlive the run.
+  void SetRunListener(vxRunListener* listener);
+  const vxRunCounts& GetRunCounts() const { return m_counts; }
+  const vxPluginSearch& GetPluginSearch() const { return m_pluginSearch; }
 
   MigrationCmdLineParser* GetCmdLineParser() { return m_cmdLineParser; }
   vxStringBase& GetSourceVersion() { return m_sourceVersion; }
@@ -84,6 +95,8 @@ class vxMigrationManager {
   // --- Product identity and version checks (checks.cpp) ---
   // The product id (1..21) of an id text, ignoring case; -1 when unknown or empty.
   static int GetProductID(const char* text);
+  // The id text of a product id, or null outside 1..21.
+  static const char* GetProductText(int id);
   // 0 when the run may start, 1 otherwise (each failure logs its own line).
   int DoCheckMigrateValidity();
   // 0 supported, 1 outside "vxmigrate.ini"'s ranges, 2 "vxmigrate.ini" could not be opened.
@@ -164,6 +177,8 @@ class vxMigrationManager {
   void ReadCommandFile();
   void FindExecutable(const char* programName);
   void OpenLog();
+  void WriteHeader(vxRunListener* listener);
+  void NoteEntry(const std::string& entry);
   void RunPlugins(bool& found);
   void RunInstallScript();
 
@@ -180,6 +195,9 @@ class vxMigrationManager {
   vxVersionDescriptor* m_destinationVersionDescriptor = nullptr;
   vxLogFile* m_log = nullptr;
   MigrationCmdLineParser* m_cmdLineParser = nullptr;
+  vxRunCounts m_counts;
+  vxPluginSearch m_pluginSearch;
+  vxRunListener* m_listener = nullptr;
 };
 
 #endif  // VXMIGRATE_MIGRATE_MANAGER_H_
