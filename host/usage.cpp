@@ -31,7 +31,7 @@ const char kHostUsage[] =
     "\n"
     "Exit status:\n"
     "  0  a plug-in ran and no step reported an error\n"
-    "  1  the run was refused by its checks (folders, products, versions, running servers)\n"
+    "  1  the run was refused by its checks (folders, products, versions, servers, log)\n"
     "  2  usage error: unknown option or unusable value; nothing was written\n"
     "  3  no plug-in served the products and versions\n"
     "  4  the plug-in ran and some steps reported errors\n"
