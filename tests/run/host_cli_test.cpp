@@ -139,5 +139,16 @@ TEST(HostCommandLine, DestinationThatIsAFileIsRefusedBeforeTheRun) {
   EXPECT_EQ("not a folder\n", ReadFile(run.Path("file")));
 }
 
+// A disk that takes nothing: the log is created but stays empty, so the run cannot end with 0.
+TEST(HostCommandLine, LogThatLosesEntriesIsAnError) {
+  HostRun run({"p10_pavsuite"});
+  EXPECT_EQ(4, run.Run(run.Options({"pavsuite", "pavsuite", "5.0", "5.5"}), -1, true));
+  EXPECT_EQ("", ReadFile(run.log));
+  EXPECT_EQ("vxmigrate: the log " + run.log + " lost entries: File too large\n", run.Err());
+  EXPECT_TRUE(Has(run.Out(), "Errors:               1\nManual actions:       0\nLog:                  " +
+                                 run.log + " (incomplete: File too large)\n"))
+      << run.Out();
+}
+
 }  // namespace
 }  // namespace vxtest

@@ -6,11 +6,13 @@
 
 #include <fcntl.h>
 #include <grp.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <csignal>
 #include <filesystem>
 #include <string>
 #include <vector>
@@ -70,8 +72,9 @@ class HostRun {
   }
 
   // Runs the host with argv[0] = its full path and the given options, as user uid when given
-  // (the child drops to it before exec); its exit status, -1 when it did not exit.
-  int Run(const Lines& options, int uid = -1) const {
+  // (the child drops to it before exec); its exit status, -1 when it did not exit. fullDisk: no
+  // file may grow (every write fails as on a full disk).
+  int Run(const Lines& options, int uid = -1, bool fullDisk = false) const {
     std::vector<std::string> args = {bin + "/vxmigrate"};
     args.insert(args.end(), options.begin(), options.end());
     std::vector<char*> argv;
@@ -79,20 +82,38 @@ class HostRun {
     argv.push_back(nullptr);
     int out = open(Path("out.txt").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
     int err = open(Path("err.txt").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
+    // Under the file-size limit the output files could not grow either: the output goes through
+    // pipes (a few hundred bytes, well within a pipe's buffer) and is saved after the run.
+    int pipes[2][2] = {{-1, -1}, {-1, -1}};
+    if (fullDisk && (pipe2(pipes[0], O_CLOEXEC) != 0 || pipe2(pipes[1], O_CLOEXEC) != 0)) return -1;
     pid_t child = fork();
     if (child == 0) {
-      dup2(out, 1);
-      dup2(err, 2);
+      dup2(fullDisk ? pipes[0][1] : out, 1);
+      dup2(fullDisk ? pipes[1][1] : err, 2);
       if (uid >= 0 && (setgroups(0, nullptr) != 0 || setgid(uid) != 0 || setuid(uid) != 0)) {
         _exit(126);
+      }
+      if (fullDisk) {
+        signal(SIGXFSZ, SIG_IGN);  // kept across exec: writes then fail with EFBIG
+        struct rlimit none = {0, 0};
+        setrlimit(RLIMIT_FSIZE, &none);
       }
       execv(argv[0], argv.data());
       _exit(127);
     }
+    int status = 0;
+    const bool waited = child > 0 && waitpid(child, &status, 0) == child;
+    for (int i = 0; i < 2 && fullDisk; ++i) {
+      close(pipes[i][1]);
+      char buffer[4096];
+      for (ssize_t n; (n = read(pipes[i][0], buffer, sizeof buffer)) > 0;) {
+        if (write(i == 0 ? out : err, buffer, n) != n) break;
+      }
+      close(pipes[i][0]);
+    }
     close(out);
     close(err);
-    int status = 0;
-    if (child < 0 || waitpid(child, &status, 0) != child) return -1;
+    if (!waited) return -1;
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
   }
   std::string Out() const { return ReadFile(Path("out.txt")); }
