@@ -36,6 +36,17 @@ vxStringBase ConvertFileTypeList(const vxStringBase& list) {
   return result;
 }
 
+// Sets the OBX list unless the file already holds it. A value is read without its trailing blank,
+// which stays in the line after the value: setting the same list again would add a second blank
+// on every run.
+void SetFileTypeList(vxMappedINIFile& settings, const char* key, const vxStringBase& list) {
+  vxStringBase current;
+  vxStringBase wanted(list);
+  wanted.stripWhite(vxStringBase::kTrailing);
+  if (settings.GetVal("defaults", key, current) == 0 && current.equals(wanted, true)) return;
+  settings.SetVal("defaults", key, list);
+}
+
 }  // namespace
 
 HaldenToOBXHelper::HaldenToOBXHelper(vxMigrationManager* manager)
@@ -83,13 +94,9 @@ int HaldenToOBXHelper::DoVXMLogINIMigrate() {
   destination.MergeFrom(source);
 
   if (bothOpen) {
-    const vxStringBase& downloads = source.GetVal("Defaults", "DownloadTypes");
-    if (!downloads.isEmpty()) {
-      destination.SetVal("defaults", "DownloadTypes", ConvertFileTypeList(downloads));
-    }
-    const vxStringBase& documents = source.GetVal("Defaults", "DocumentTypes");
-    if (!documents.isEmpty()) {
-      destination.SetVal("defaults", "DocumentTypes", ConvertFileTypeList(documents));
+    for (const char* key : {"DownloadTypes", "DocumentTypes"}) {
+      const vxStringBase& list = source.GetVal("Defaults", key);
+      if (!list.isEmpty()) SetFileTypeList(destination, key, ConvertFileTypeList(list));
     }
   }
 

@@ -15,6 +15,7 @@
 #include "foundation/files/run_doors.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_index.h"
+#include "migrate/internal/failed_copy.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/internal/resolved_path.h"
 #include "migrate/manager.h"
@@ -260,7 +261,10 @@ void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
   const vxStringBase& source = file.Pathname();
   if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
                               nullptr) != 0) {
-    manager->Log("Error: Unable to open file:   ", source.c_str());
+    // The source is named only when it is the side that could not be read.
+    const vxFailedCopy blame = vxBlameFailedCopy(source, target);
+    manager->Log(blame.path == &target ? blame.text : "Error: Unable to open file:   ",
+                 blame.path->c_str());
     return;
   }
   vxMappedINIFile profile(target);
@@ -299,9 +303,10 @@ int HaldenToOBXHelper::DoHaldenToOBXProfileFileMigrate() {
   vxFileInfoList profiles;
   vxFileManager::GetFileList(sourceProfiles, "*.wlp", profiles, 1);
 
-  vxStringBase exclusions;
-  manager_->MakeFullExclusionList(exclusions, manager_->GetCmdLineParser()->GetValue("PFLog"),
-                                  kProfileFolder, "wlp", GetSampleFileList("halsuite", "wlp"));
+  // Also reports each selected name that matches no profile.
+  const vxStringBase exclusions =
+      MakeProfileExclusions(*manager_, manager_->GetCmdLineParser()->GetValue("PFLog"),
+                            kProfileFolder, "wlp", GetSampleFileList("halsuite", "wlp"));
   const vxExclusionIndex excluded(*manager_, exclusions, vxStringBase::NullStr, 0);
   AdvancedOptionIds ids(manager_);
 

@@ -1,52 +1,65 @@
-// The vxmigrate host: builds the migration manager from its command line and runs the migration.
-// An incomplete command line (and no usable "migcmd.ini") prints the usage text and exits 1 without
-// writing a log; otherwise the exit status is the run's result.
+// The vxmigrate host: reads its own options, builds the migration manager from the rest, runs the
+// migration and tells the user what happened. The exit status says how the run ended (see
+// exit_status.h); nothing is written before the command line has been found usable.
 
 #include <cstdio>
+#include <cstring>
+#include <string>
 
+#include "host/exit_status.h"
+#include "host/options.h"
+#include "host/terminal_report.h"
+#include "host/usage.h"
 #include "migrate/manager.h"
 
-namespace {
-
-const char kUsage[] =
-    "Usage: vxmigrate -D1:<source folder> -D2:<destination folder>\n"
-    "                 -P1:<source product> -P2:<destination product>\n"
-    "                 -V1:<source version> -V2:<destination version>\n"
-    "                 [-FT:Y|N] [-cmd:<command file or its folder>]\n"
-    "                 [-PFLog:<profiles>] [-PFProxy:<profiles>] [-PFStream:<profiles>]\n"
-    "                 [-PFLink:<profiles>] [-PFAlert:<profiles>]\n"
-    "\n"
-    "  -D1, -D2     source and destination installation folders\n"
-    "  -P1, -P2     source and destination product ids (for example pavsuite, obx)\n"
-    "  -V1, -V2     source and destination versions (for example 5.5, 6.0)\n"
-    "  -FT          Y (default) copies profile data folders with their profiles; N does not\n"
-    "  -cmd         command file \"migcmd.ini\", or the folder holding it; read when the\n"
-    "               command line is incomplete (default: the folder of vxmigrate)\n"
-    "  -PFLog, -PFProxy, -PFStream, -PFLink, -PFAlert\n"
-    "               comma-separated profile file names to migrate (default: all)\n";
-
-}  // namespace
-
 int main(int argc, char** argv) {
-  vxMigrationManager manager(argc, argv);
+  HostOptions options = ReadHostOptions(argc, argv);
+  switch (options.action) {
+    case HostAction::kHelp:
+      fputs(kHostUsage, stdout);
+      return kExitDone;
+    case HostAction::kVersion:
+      fputs(kHostVersion, stdout);
+      return kExitDone;
+    case HostAction::kUsageError:
+      fputs(options.error.c_str(), stderr);
+      return kExitUsage;
+    case HostAction::kMigrate:
+      break;
+  }
+
+  vxMigrationManager manager(static_cast<int>(options.managerArguments.size()),
+                             options.managerArguments.data());
   if (!manager.IsValid()) {
-    fputs(kUsage, stderr);
-    return 1;
+    // Every option on the command line was usable, so what is wrong is what is missing.
+    fprintf(stderr, "vxmigrate: incomplete run: missing %s, and no usable migcmd.ini gives it\n",
+            options.missingRunOptions.c_str());
+    fputs(kHostHint, stderr);
+    return kExitUsage;
   }
+  TerminalReport report(options.verbosity, stdout, stderr);
   if (manager.IsDestinationBusy()) {
-    fprintf(stderr,
-            "vxmigrate: another run is migrating into %s; nothing was written. Try again when it "
-            "has finished.\n",
-            manager.GetDestinationDirectory().c_str());
-    return 5;
+    report.HostError("another run is migrating into " + manager.GetDestinationDirectory().str() +
+                     "; nothing was written. Try again when it has finished.");
+    return kExitDestinationBusy;
   }
-  int result = manager.DoMigration();
   const vxLogFile* log = manager.GetLog();
-  if (log->IsOpen()) {
-    printf("VXMigrate log: %s\n", log->GetFilename().c_str());
-  } else {
-    // Typically a destination folder that does not exist: the log has nowhere to go.
-    fprintf(stderr, "vxmigrate: cannot write the log %s\n", log->GetFilename().c_str());
+  if (!log->IsOpen()) {
+    // Typically a destination folder that does not exist, or a file, or one inside the source: a
+    // run without its log would hide everything it did. The checks (which only read) still tell
+    // the user why, on standard error.
+    manager.SetRunListener(&report);
+    manager.DoCheckMigrateValidity();
+    report.HostError("cannot write the log " + log->GetFilename().str() + ": " +
+                     strerror(log->OpenError()));
+    return kExitRefused;
   }
-  return result;
+  manager.SetRunListener(&report);
+  int result = manager.DoMigration();
+  if (log->WriteError() != 0) {
+    report.HostError("the log " + log->GetFilename().str() + " lost entries: " +
+                     strerror(log->WriteError()));
+  }
+  report.PrintSummary(manager, result, log->WriteError());
+  return RunExitStatus(manager, result, log->WriteError());
 }

@@ -4,6 +4,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <string>
+
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
 #include "foundation/files/run_doors.h"
@@ -25,7 +27,11 @@ const ProductEntry kProducts[] = {
     {16, "sysguard"}, {17, "vxobx_nt"}, {18, "vxobx_sun"}, {19, "vxobx_linux"}, {20, "obx"},
     {21, "tqrs"},    {0, nullptr}};
 
-bool FolderExists(const vxStringBase& folder) { return access(folder.c_str(), F_OK) == 0; }
+// A file where the folder should be is no installation folder either.
+bool FolderExists(const vxStringBase& folder) {
+  struct stat st;
+  return stat(folder.c_str(), &st) == 0 && S_ISDIR(st.st_mode);
+}
 
 // The source folder without trailing separators ("/opt/a/" -> "/opt/a"), so that a trailing
 // separator cannot hide a destination below it. The root itself stays "/".
@@ -38,6 +44,12 @@ vxStringBase WithoutTrailingSeparators(const vxStringBase& folder) {
   return trimmed;
 }
 
+// "obx 1.0 to 4.5": a product's section of "vxmigrate.ini" as the user reads it.
+std::string RangeText(const vxMappedINIFile& ranges, const vxStringBase& section) {
+  return section.str() + " " + ranges.GetVal(section, "Low").str() + " to " +
+         ranges.GetVal(section, "High").str();
+}
+
 }  // namespace
 
 int vxMigrationManager::GetProductID(const char* text) {
@@ -47,6 +59,13 @@ int vxMigrationManager::GetProductID(const char* text) {
     if (name.equals(entry->text, false)) return entry->id;
   }
   return -1;
+}
+
+const char* vxMigrationManager::GetProductText(int id) {
+  for (const ProductEntry* entry = kProducts; entry->id != 0; ++entry) {
+    if (entry->id == id) return entry->text;
+  }
+  return nullptr;
 }
 
 int vxMigrationManager::DoCheckMigrateValidity() {
@@ -111,10 +130,14 @@ int vxMigrationManager::DoCheckVersions(const vxStringBase& sourceSection,
   vxStringBase path;
   vxFileManager::MakePath(path, vxFilename(m_executable).Directory(), "vxmigrate.ini", 1);
   vxMappedINIFile ranges(path);
+  m_pluginSearch.rangesFile = path.str();
   if (ranges.Open(0) != 0) {
     Log("Error: Unable to open file:   ", path.c_str());
     return 2;
   }
+  // Kept for the host, which shows the ranges when no plug-in accepted the versions.
+  m_pluginSearch.ranges =
+      RangeText(ranges, sourceSection) + ", " + RangeText(ranges, destinationSection);
   vxVersionDescriptor sourceLow(ranges.GetVal(sourceSection, "Low"));
   vxVersionDescriptor sourceHigh(ranges.GetVal(sourceSection, "High"));
   vxVersionDescriptor destinationLow(ranges.GetVal(destinationSection, "Low"));

@@ -13,6 +13,7 @@
 #include "foundation/files/filename.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/internal/exclusion_index.h"
+#include "migrate/internal/failed_copy.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 
@@ -39,7 +40,7 @@ void ReportFilesNotCopied(vxMigrationManager& manager, const vxStringBase& sourc
     if (!file.IsRegular() && !file.IsSymlink()) continue;  // pipes and devices are not copied
     vxFileManager::MakePath(destination, destinationFolder, file.GetFilename().Filename(), 1);
     if (!vxFileManager::Exists(destination)) {
-      manager.Log(vxMsgUnableToCopyFile, file.GetFilename().Pathname().c_str());
+      vxLogFailedCopy(manager, file.GetFilename().Pathname(), destination);
     }
   }
 }
@@ -117,9 +118,9 @@ int vxMigrationManager::CopyFiles(const vxStringBase& fileNames, unsigned int co
     vxFileManager::MakePath(destination, m_destinationDirectory, vxStringBase::NullStr, name);
     if (vxFileManager::CopyFile(source, destination, 0, 1, copyOption, 0, 0, nullptr, nullptr) == 0) {
       Log(kFileCopied, source.c_str());
-    } else if (vxFileManager::Exists(source) &&
+    } else if (!vxIsAbsent(source) &&
                !(copyOption != 0 && KeptAsNewer(source, destination))) {
-      Log(vxMsgUnableToCopyFile, source.c_str());
+      vxLogFailedCopy(*this, source, destination);
     }
   }
   return 0;
@@ -151,7 +152,7 @@ int vxMigrationManager::CopyAllFilesOfType(const vxStringBase& extension,
       } else if (vxFileManager::Exists(destination)) {
         Log(kFileExists, source.c_str());
       } else {
-        Log(vxMsgUnableToCopyFile, source.c_str());
+        vxLogFailedCopy(*this, source, destination);
       }
     }
   }

@@ -15,6 +15,7 @@
 #include "foundation/files/basic_file.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/string/tokenizer.h"
+#include "migrate/internal/failed_copy.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -301,17 +302,31 @@ int vxMigrationManager::DoMergeCSVFile(const char* sourceFile, const char* desti
   vxFileManager::MakePath(sourcePath, m_sourceDirectory, sourceFile, 1);
   vxFileManager::MakePath(destinationPath, m_destinationDirectory, destinationFile, 1);
 
+  // Failures leave the log as it has always been; the host still hears of each one.
   if (!vxFileManager::Exists(destinationPath)) {
     Log("TXT file doesn't exist - file being copied: ", sourcePath.c_str());
-    return vxFileManager::CopyFile(sourcePath, destinationPath, 0, 1, 0, 0, 0, nullptr, nullptr);
+    const int copied =
+        vxFileManager::CopyFile(sourcePath, destinationPath, 0, 1, 0, 0, 0, nullptr, nullptr);
+    if (copied != 0 && !vxIsAbsent(sourcePath)) {
+      const vxFailedCopy blame = vxBlameFailedCopy(sourcePath, destinationPath);
+      ReportUnloggedFailure(blame.text, blame.path->c_str());
+    }
+    return copied;
   }
 
   // The old installation is only read, so it may sit on a read-only disk; the destination is
   // opened for writing, which also tells early whether it can be rewritten.
   vxStringBase sourceText;
   vxStringBase destinationText;
-  if (!ReadWholeFile(sourcePath, O_RDONLY, sourceText)) return 1;
-  if (!ReadWholeFile(destinationPath, O_RDWR, destinationText)) return 1;
+  if (!ReadWholeFile(sourcePath, O_RDONLY, sourceText)) {
+    if (!vxIsAbsent(sourcePath)) ReportUnloggedFailure(vxMsgUnableToOpenFile, sourcePath.c_str());
+    return 1;
+  }
+  if (!ReadWholeFile(destinationPath, O_RDWR, destinationText)) {
+    ReportUnloggedFailure(vxCanRead(destinationPath) ? vxMsgUnableToWriteFile : vxMsgUnableToOpenFile,
+                          destinationPath.c_str());
+    return 1;
+  }
   if (sourceText.isEmpty()) return 1;
   const size_t destinationSize = destinationText.str().size();
   if (destinationSize > kMaxMergedSize ||
@@ -325,7 +340,10 @@ int vxMigrationManager::DoMergeCSVFile(const char* sourceFile, const char* desti
   } catch (const std::bad_alloc&) {
     return 1;  // out of memory: the destination stays as it was
   }
-  if (!RewriteFile(destinationPath, merged)) return 1;
+  if (!RewriteFile(destinationPath, merged)) {
+    ReportUnloggedFailure(vxMsgUnableToWriteFile, destinationPath.c_str());
+    return 1;
+  }
   Log("Data File Merged: ", destinationFile);
   return 0;
 }

@@ -9,6 +9,7 @@
 #include "foundation/files/filename.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/internal/exclusion_index.h"
+#include "migrate/internal/failed_copy.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 
@@ -51,7 +52,7 @@ int vxMigrationManager::MergeINIFiles(const char* sourceFile, const char* destin
   if (!vxFileManager::Exists(destination.Pathname())) {
     const int copied = vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
     Log(kIniCopied, source.Pathname().c_str());
-    if (copied != 0) Log(vxMsgUnableToCopyFile, source.Pathname().c_str());
+    if (copied != 0) vxLogFailedCopy(*this, source.Pathname(), destination.Pathname());
     return 1;
   }
 

@@ -7,6 +7,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/internal/failed_copy.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -35,10 +36,19 @@ int vxMigrationManager::DoKeywordINIMerge() {
   vxFileManager::MakePath(sourcePath, m_sourceDirectory, "keywords.ini", 1);
   vxFileManager::MakePath(destinationPath, m_destinationDirectory, "keywords.ini", 1);
 
+  // Failures leave the log as it has always been; the host still hears of each one.
   vxMappedINIFile source(sourcePath);
-  if (source.Open(0) != 0) return 1;
+  if (source.Open(0) != 0) {
+    if (!vxIsAbsent(sourcePath)) ReportUnloggedFailure(vxMsgUnableToOpenFile, sourcePath.c_str());
+    return 1;
+  }
   vxMappedINIFile destination(destinationPath);
-  if (destination.Open(0) != 0) return 1;
+  if (destination.Open(0) != 0) {
+    if (!vxIsAbsent(destinationPath)) {
+      ReportUnloggedFailure(vxMsgUnableToOpenFile, destinationPath.c_str());
+    }
+    return 1;
+  }
 
   const INILineList* destinationEngines = destination.GetPropertyList(kSearchEngines);
   if (destinationEngines == nullptr) return 1;
@@ -65,5 +75,7 @@ int vxMigrationManager::DoKeywordINIMerge() {
 
   Log("keywords.ini merged");
   source.Close(0);
-  return destination.Close(1) == 0 ? 0 : 1;
+  if (destination.Close(1) == 0) return 0;
+  ReportUnloggedFailure(vxMsgUnableToWriteFile, destinationPath.c_str());
+  return 1;
 }

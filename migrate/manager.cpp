@@ -96,12 +96,31 @@ void vxMigrationManager::Log(const char* text) {
   if (m_log == nullptr) return;
   m_log->m_level = kLogNormal;
   m_log->Log(text, kLogNormal);
+  NoteEntry(vxLogFile::EntryText(text, nullptr));
 }
 
 void vxMigrationManager::Log(const char* text, const char* value) {
   if (m_log == nullptr) return;
   m_log->m_level = kLogNormal;
   m_log->Log(text, value, kLogNormal);
+  NoteEntry(vxLogFile::EntryText(text, value));
+}
+
+// Counted and told even when the log itself could not take the entry (a full disk): the host's
+// report must not depend on the log's disk.
+void vxMigrationManager::NoteEntry(const std::string& entry) {
+  m_counts.Count(entry);
+  if (m_listener != nullptr) m_listener->OnLogEntry(entry);
+}
+
+void vxMigrationManager::ReportUnloggedFailure(const char* text, const char* value) {
+  ++m_counts.errors;
+  if (m_listener != nullptr) m_listener->OnUnloggedFailure(vxLogFile::EntryText(text, value));
+}
+
+void vxMigrationManager::SetRunListener(vxRunListener* listener) {
+  m_listener = listener;
+  if (listener != nullptr && m_log != nullptr) WriteHeader(listener);
 }
 
 // The command file fills in what the command line lacks: its "main" keys overwrite the options of
@@ -157,15 +176,30 @@ void vxMigrationManager::OpenDoorsAndLog() {
   vxStringBase path;
   vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
   m_log = new vxLogFile(path, 1);
-  Log("VXMigrate Log File: ", m_log->GetFilename().c_str());
-  Log("VXMigrate Executable: ", m_executable.c_str());
-  Log("Source Path: ", m_sourceDirectory.c_str());
-  Log("Destination Path: ", m_destinationDirectory.c_str());
-  Log("Source Version: ", m_sourceVersion.c_str());
-  Log("Destination Version: ", m_destinationVersion.c_str());
-  Log("Source Product: ", m_sourceProduct.c_str());
-  Log("Destination Product: ", m_destinationProduct.c_str());
-  Log("\r\n\r\n");
+  WriteHeader(nullptr);
+}
+
+// The header's nine entries: into the log (listener null), or told to a listener that arrives
+// after the log was opened, so that it sees the whole log.
+void vxMigrationManager::WriteHeader(vxRunListener* listener) {
+  const char* const header[][2] = {{"VXMigrate Log File: ", m_log->GetFilename().c_str()},
+                                   {"VXMigrate Executable: ", m_executable.c_str()},
+                                   {"Source Path: ", m_sourceDirectory.c_str()},
+                                   {"Destination Path: ", m_destinationDirectory.c_str()},
+                                   {"Source Version: ", m_sourceVersion.c_str()},
+                                   {"Destination Version: ", m_destinationVersion.c_str()},
+                                   {"Source Product: ", m_sourceProduct.c_str()},
+                                   {"Destination Product: ", m_destinationProduct.c_str()},
+                                   {"\r\n\r\n", nullptr}};
+  for (const auto& entry : header) {
+    if (listener != nullptr) {
+      listener->OnLogEntry(vxLogFile::EntryText(entry[0], entry[1]));
+    } else if (entry[1] != nullptr) {
+      Log(entry[0], entry[1]);
+    } else {
+      Log(entry[0]);
+    }
+  }
 }
 
 int vxMigrationManager::DoMigration() {
@@ -200,10 +234,19 @@ void vxMigrationManager::RunPlugins(bool& found) {
   vxFileManager::GetFileList(folder, "*.so", plugins, 1);
   vxMigrateInfo info;
   for (const vxFileInfo& entry : plugins) {
-    vxSharedLib library(entry.GetFilename().Pathname().c_str());
+    const vxStringBase& path = entry.GetFilename().Pathname();
+    vxSharedLib library(path.c_str());
+    if (!library.IsLoaded()) {
+      // Skipped without a log line, as the run has always done; the host shows why.
+      // The loader's message usually names the file already.
+      std::string why = library.LoadError().str();
+      if (why.find(path.str()) == std::string::npos) why = path.str() + ": " + why;
+      m_pluginSearch.notLoaded.push_back(why);
+      continue;
+    }
     auto initialize =
         reinterpret_cast<vxMigrateInitializeEntry>(library.ProcAddr("MigrateInitialize"));
-    if (initialize == nullptr) continue;  // not a shared object, or not a migration plug-in
+    if (initialize == nullptr) continue;  // a shared object, but not a migration plug-in
 
     for (vxStringBase* field : {&info.sourceProduct, &info.destinationProduct, &info.note1,
                                 &info.note2, &info.note3, &info.note4}) {
@@ -212,7 +255,7 @@ void vxMigrationManager::RunPlugins(bool& found) {
     try {
       initialize(&info);
     } catch (...) {
-      Log("Error: Migration library failed to initialize: ", entry.GetFilename().Pathname().c_str());
+      Log("Error: Migration library failed to initialize: ", path.c_str());
       continue;
     }
     if (!m_sourceProduct.equals(info.sourceProduct, false) ||
@@ -221,23 +264,30 @@ void vxMigrationManager::RunPlugins(bool& found) {
     }
     int versions = DoCheckVersions(info.sourceProduct, info.destinationProduct);
     if (versions == 2) {
+      m_pluginSearch.rangesUnreadable = true;
       Log("Error: Can't open vxmigrate.ini - make sure it's present and isn't read only");
       return;
     }
-    if (versions == 1) continue;
+    if (versions == 1) {
+      m_pluginSearch.outOfRange.push_back(path.str());
+      continue;
+    }
 
     auto migrate = reinterpret_cast<vxMigrateEntry>(library.ProcAddr("Migrate"));
     found = migrate != nullptr;
     if (found) {
+      m_pluginSearch.ran = path.str();
       DeleteAMService();
       StopAMService();
       try {
         migrate(this);
       } catch (...) {
         // A plug-in's exception must not reach the host: the run still ends with its last lines.
-        Log("Error: Migration library failed: ", entry.GetFilename().Pathname().c_str());
+        Log("Error: Migration library failed: ", path.c_str());
       }
       StartAMService();
+    } else {
+      m_pluginSearch.withoutMigrate = path.str();
     }
     return;
   }

@@ -14,11 +14,13 @@
 
 #include <cstdint>
 #include <memory>
+#include <string>
 
 #include "foundation/files/log_file.h"
 #include "foundation/string/string_base.h"
 #include "foundation/string/version.h"
 #include "migrate/cmdline_parser.h"
+#include "migrate/run_report.h"
 
 // What a plug-in's "MigrateInitialize" fills in: the pair of products it migrates between, and four
 // further texts for its own use (emptied before the call, never read by the run).
@@ -67,6 +69,15 @@ class vxMigrationManager {
   void Log(const char* text);
   // text immediately followed by value, as one entry.
   void Log(const char* text, const char* value);
+  // A failed step whose log text is fixed to say nothing: counted as an error and told to the
+  // listener, never written to the log. text is followed directly by value (a file's path).
+  void ReportUnloggedFailure(const char* text, const char* value);
+
+  // The host's view of the run. The listener is told the entries already written (the header)
+  // at once, then each entry as it is logged; it is not owned and must outlive the run.
+  void SetRunListener(vxRunListener* listener);
+  const vxRunCounts& GetRunCounts() const { return m_counts; }
+  const vxPluginSearch& GetPluginSearch() const { return m_pluginSearch; }
 
   MigrationCmdLineParser* GetCmdLineParser() { return m_cmdLineParser; }
   vxStringBase& GetSourceVersion() { return m_sourceVersion; }
@@ -95,6 +106,8 @@ class vxMigrationManager {
   // --- Product identity and version checks (checks.cpp) ---
   // The product id (1..21) of an id text, ignoring case; -1 when unknown or empty.
   static int GetProductID(const char* text);
+  // The id text of a product id, or null outside 1..21.
+  static const char* GetProductText(int id);
   // 0 when the run may start, 1 otherwise (each failure logs its own line).
   int DoCheckMigrateValidity();
   // 0 supported, 1 outside "vxmigrate.ini"'s ranges, 2 "vxmigrate.ini" could not be opened.
@@ -176,6 +189,8 @@ class vxMigrationManager {
   void ReadCommandFile();
   void FindExecutable();
   void OpenDoorsAndLog();
+  void WriteHeader(vxRunListener* listener);
+  void NoteEntry(const std::string& entry);
   void RunPlugins(bool& found);
   void RunInstallScript();
 
@@ -195,6 +210,9 @@ class vxMigrationManager {
   std::unique_ptr<vxFolderLock> m_destinationLock;
   std::unique_ptr<vxRunDoors> m_doors;
   bool m_destinationBusy = false;
+  vxRunCounts m_counts;
+  vxPluginSearch m_pluginSearch;
+  vxRunListener* m_listener = nullptr;
 };
 
 #endif  // VXMIGRATE_MIGRATE_MANAGER_H_

@@ -29,12 +29,16 @@ std::string TimeStamp() {
 
 vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
   int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
-  if (!vxfiles::MayWrite(filename_.view())) return;  // no log where the run may not write
+  if (!vxfiles::MayWrite(filename_.view())) {  // no log where the run may not write
+    openError_ = EPERM;
+    return;
+  }
   // A link where the log belongs is removed, never followed: it could point into the source
   // installation, which the run must not change.
   struct stat st;
   if (lstat(filename_.c_str(), &st) == 0 && S_ISLNK(st.st_mode)) unlink(filename_.c_str());
   fd_ = open(filename_.c_str(), flags | O_NOFOLLOW, 0644);
+  if (fd_ < 0) openError_ = errno;
 }
 
 vxLogFile::~vxLogFile() {
@@ -51,13 +55,31 @@ void vxLogFile::Log(const char* text, const char* text2, LogLevel level) {
   WriteEntry(text, text2);
 }
 
+std::string vxLogFile::EntryText(const char* text, const char* text2) {
+  std::string joined;
+  if (text != nullptr) joined += text;
+  if (text2 != nullptr) joined += text2;
+  if (joined.find_first_not_of("\r\n") == std::string::npos) return joined;
+  std::string escaped;
+  escaped.reserve(joined.size());
+  for (char c : joined) {
+    if (c == '\n') {
+      escaped += "\\n";
+    } else if (c == '\r') {
+      escaped += "\\r";
+    } else {
+      escaped += c;
+    }
+  }
+  return escaped;
+}
+
 void vxLogFile::WriteEntry(const char* text, const char* text2) {
   if (fd_ < 0) return;
   std::string entry = TimeStamp();
   entry += "  ";
-  if (text != nullptr) entry += text;
-  if (text2 != nullptr) entry += text2;
+  entry += EntryText(text, text2);
   entry += '\n';
-  // A full disk loses the entry, never the run.
-  vxWriteAll(fd_, entry.data(), entry.size());
+  // A full disk loses the entry, never the run; the first failure is kept for the host to report.
+  if (!vxWriteAll(fd_, entry.data(), entry.size()) && writeError_ == 0) writeError_ = errno;
 }

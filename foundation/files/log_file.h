@@ -1,8 +1,12 @@
 // The run log. Each entry is one line, "YYYY-MM-DD HH:MM:SS  text\n" in local time, handed to the
 // kernel as it is logged, so the log of a run that crashed holds every entry up to the crash.
+// Line feeds and carriage returns inside an entry are written as "\n" and "\r", so one entry is
+// always one line; only an entry made of nothing but line ends (a deliberate blank) stays as it is.
 
 #ifndef VXMIGRATE_FOUNDATION_FILES_LOG_FILE_H_
 #define VXMIGRATE_FOUNDATION_FILES_LOG_FILE_H_
+
+#include <string>
 
 #include "foundation/string/string_base.h"
 
@@ -22,8 +26,15 @@ class vxLogFile {
   // Writes one entry made of the two texts in order.
   void Log(const char* text, const char* text2, LogLevel level);
 
+  // The entry's text as the log writes it, without the time stamp: the two texts joined (either
+  // may be null), line ends escaped.
+  static std::string EntryText(const char* text, const char* text2);
+
   const vxStringBase& GetFilename() const { return filename_; }
   bool IsOpen() const { return fd_ >= 0; }
+  // The errno of the failed open, or of the first entry that could not be written; 0 when none.
+  int OpenError() const { return openError_; }
+  int WriteError() const { return writeError_; }
 
   // The most detailed level written; callers set it to 1 before each write.
   int m_level = kLogNormal;
@@ -33,6 +44,8 @@ class vxLogFile {
 
   vxStringBase filename_;
   int fd_ = -1;
+  int openError_ = 0;
+  int writeError_ = 0;
 };
 
 #endif  // VXMIGRATE_FOUNDATION_FILES_LOG_FILE_H_

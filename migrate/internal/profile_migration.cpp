@@ -37,7 +37,7 @@ void LogUnknownSelections(vxMigrationManager& manager, const vxStringBase& selec
     if (name.isEmpty()) continue;
     std::string folded = vxFoldCase(name.view());
     if (present.count(folded) != 0 || !reported.insert(folded).second) continue;
-    manager.Log("Selected profile not found: ", name.c_str());
+    manager.Log("Error: Selected profile not found: ", name.c_str());
   }
 }
 

@@ -15,7 +15,7 @@ class vxMigrationManager;
 
 // The exclusion list of bare names for the profiles "*.<extension>" of the source's folder: every
 // profile the selection does not name, then fixedList (fixedList alone for an empty selection).
-// Each selected name that matches no such profile is logged as "Selected profile not found: ".
+// Each selected name that matches no such profile is logged as "Error: Selected profile not found: ": the user asked for it.
 vxStringBase MakeProfileExclusions(vxMigrationManager& manager, const vxStringBase& selection,
                                    const char* folder, const char* extension,
                                    const char* fixedList);

@@ -30,7 +30,7 @@ TEST(DoCopyLogProfiles, CopiesTheSelectionWithItsDataFoldersAndReportsUnknownNam
             run.DestinationTree());
   EXPECT_EQ((Entries{"from an earlier run", "p/sales.wlp"}),
             run.ReadDst({"p/web_vxmigrate.dat/h", "p/sales_vxmigrate.wlp"}));
-  EXPECT_EQ((Entries{"Selected profile not found: ghost.wlp",
+  EXPECT_EQ((Entries{"Error: Selected profile not found: ghost.wlp",
                      "File copied:  <dst>/p/sales_vxmigrate.wlp",
                      "File copied:  <dst>/p/web_vxmigrate.wlp",
                      "Folder copied:  <dst>/p/sales_vxmigrate.dat/",
