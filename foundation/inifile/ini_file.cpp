@@ -27,6 +27,7 @@ void vxMappedINIFile::SetFilename(const vxStringBase& filename) {
 
 void vxMappedINIFile::Clear() {
   sectionIndex_.clear();  // its keys point into the sections
+  sectionExact_.clear();
   sections_.clear();
   text_.reset();
   preambleEnd_ = 0;
@@ -34,9 +35,30 @@ void vxMappedINIFile::Clear() {
   duplicateSections_ = 0;
 }
 
+// A name spelt exactly as a section that differs from an earlier one in case alone finds that
+// section; any other spelling finds the first section of the name, case ignored.
 vxMappedINIFile::Section* vxMappedINIFile::FindSection(std::string_view name) const {
   auto it = sectionIndex_.find(name);
-  return it == sectionIndex_.end() ? nullptr : it->second;
+  if (it == sectionIndex_.end()) return nullptr;
+  if (!sectionExact_.empty() && it->second->name != name) {
+    auto exact = sectionExact_.find(name);
+    if (exact != sectionExact_.end()) return exact->second;
+  }
+  return it->second;
+}
+
+void vxMappedINIFile::IndexSection(Section* section) {
+  auto [first, added] = sectionIndex_.emplace(section->name, section);
+  if (added) return;
+  ++duplicateSections_;
+  if (first->second->name != section->name) sectionExact_.emplace(section->name, section);
+}
+
+void vxMappedINIFile::RebuildSectionIndex() {
+  sectionIndex_.clear();
+  sectionExact_.clear();
+  duplicateSections_ = 0;
+  for (const auto& section : sections_) IndexSection(section.get());
 }
 
 vxMappedINIFile::Section* vxMappedINIFile::FindOrAddSection(std::string_view name) {
@@ -48,22 +70,30 @@ vxMappedINIFile::Section* vxMappedINIFile::FindOrAddSection(std::string_view nam
   section->nameFromCaller = true;
   Section* added = section.get();
   sections_.push_back(std::move(section));
-  sectionIndex_.emplace(added->name, added);
+  IndexSection(added);
   return added;
 }
 
 INILine* vxMappedINIFile::FindLine(const Section& section, std::string_view key) const {
   section.EnsureIndex();
+  INILine* found = FindIndexedLine(section, key);
+  if (found == nullptr && section.index.count(key) != 0) {
+    // A caller renamed a key in place: index the lines afresh and trust only a verified hit.
+    section.RebuildIndex();
+    found = FindIndexedLine(section, key);
+  }
+  return found;
+}
+
+// The line of key as indexed, when its key (which callers may have changed) still matches.
+INILine* vxMappedINIFile::FindIndexedLine(const Section& section, std::string_view key) const {
   auto it = section.index.find(key);
   if (it == section.index.end()) return nullptr;
-  if (vxini::EqualsFolded(it->second->m_key.view(), key)) return it->second;
-  // A caller renamed a key in place: index the lines afresh and trust only a verified hit.
-  section.RebuildIndex();
-  it = section.index.find(key);
-  if (it != section.index.end() && vxini::EqualsFolded(it->second->m_key.view(), key)) {
-    return it->second;
+  if (!section.exact.empty() && it->second->m_key.view() != key) {
+    auto exact = section.exact.find(key);
+    if (exact != section.exact.end() && exact->second->m_key.view() == key) return exact->second;
   }
-  return nullptr;
+  return vxini::EqualsFolded(it->second->m_key.view(), key) ? it->second : nullptr;
 }
 
 void vxMappedINIFile::AppendLine(Section& section, INILine* line) {
@@ -71,7 +101,7 @@ void vxMappedINIFile::AppendLine(Section& section, INILine* line) {
   section.EnsureIndex();
   section.lines.push_back(line);
   owned.release();
-  section.index.emplace(line->LoadedKey(), line);
+  section.Index(line);
   section.indexedCount = section.lines.size();
 }
 
@@ -171,6 +201,8 @@ int vxMappedINIFile::RemoveKey(const vxStringBase& section, const vxStringBase& 
     }
   }
   found->indexedCount = lines.size();
+  // Spellings that differ in case alone: which line each spelling finds is rebuilt whole.
+  if (!found->exact.empty()) found->RebuildIndex();
   delete line;
   return 0;
 }
@@ -220,8 +252,9 @@ void vxMappedINIFile::UpdateMapSection(const char* section, const INILineList* l
 void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other) {
   if (&other == this) return;
   for (const auto& from : other.sections_) {
-    // A section repeated in the other file is hidden there too: only the first counts.
-    if (other.FindSection(from->name) != from.get()) continue;
+    // A section repeated in the other file, in any spelling, is hidden there too: sections meet
+    // their namesakes here ignoring case, so only the first of a name counts.
+    if (other.sectionIndex_.find(from->name)->second != from.get()) continue;
     Section* target = FindOrAddSection(from->name);
     from->EnsureIndex();
     for (const INILine* line : from->lines) {
@@ -241,6 +274,13 @@ int vxMappedINIFile::RenameSection(const vxStringBase& from, const vxStringBase&
   if (existing != nullptr && existing != section) return 1;
 
   std::string oldName = section->name;
+  if (!sectionExact_.empty()) {
+    // Names that differ in case alone: which section each spelling finds is rebuilt whole.
+    section->name = to.str();
+    section->nameFromCaller = true;
+    RebuildSectionIndex();
+    return 0;
+  }
   sectionIndex_.erase(section->name);
   section->name = to.str();
   section->nameFromCaller = true;

@@ -1,5 +1,7 @@
 // An INI settings file held in memory as sections of key-value lines. Lookups of sections and keys
-// ignore ASCII case and keep the spelling on disk; each costs constant average time. A file opened
+// ignore ASCII case and keep the spelling on disk; a name spelt exactly as one on disk finds that
+// one first, so two keys that differ in case alone keep their own values. Each lookup costs
+// constant average time. A file opened
 // and written back unchanged is byte-identical. Close(1) replaces the file atomically and never
 // replaces an existing file that this object did not load. Not thread-safe.
 
@@ -90,6 +92,9 @@ class vxMappedINIFile {
       std::unordered_map<std::string_view, Section*, vxini::FoldHash, vxini::FoldEqual>;
 
   Section* FindSection(std::string_view name) const;
+  void IndexSection(Section* section);
+  void RebuildSectionIndex();
+  INILine* FindIndexedLine(const Section& section, std::string_view key) const;
   Section* FindOrAddSection(std::string_view name);
   // The first line of the section with that key, or null. Rebuilds the section's index when the
   // callers changed its list behind the object's back.
@@ -107,6 +112,7 @@ class vxMappedINIFile {
   vxini::Eol fileEol_ = vxini::Eol::kLF;     // line end for new lines: the file's first, else LF
   std::vector<std::unique_ptr<Section>> sections_;  // file order
   SectionIndex sectionIndex_;                       // name -> first section of that name
+  std::unordered_map<std::string_view, Section*> sectionExact_;  // later sections spelt otherwise
   size_t duplicateSections_ = 0;                    // sections hidden behind an earlier namesake
 
   friend class INIFileReader;

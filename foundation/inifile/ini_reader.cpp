@@ -104,7 +104,7 @@ void INIFileReader::Parse(vxMappedINIFile& file, std::shared_ptr<const std::stri
       section->headerEol = eol;
       current = section.get();
       file.sections_.push_back(std::move(section));
-      if (!file.sectionIndex_.emplace(current->name, current).second) ++file.duplicateSections_;
+      file.IndexSection(current);
       pending = next;
     } else if (current != nullptr && ParseProperty(d, first, end, &key, &value)) {
       auto line = std::unique_ptr<INILine>(new INILine());

@@ -1,6 +1,8 @@
 // One section of a vxMappedINIFile: its header line, its property lines in file order, the
 // non-property lines after the last property line, and a lazily built index from the key (ASCII
-// case ignored) to the first line holding it. Internal to the INI model; owns its lines.
+// case ignored) to the first line holding it. Keys that differ from that first line's only in case
+// are also indexed by their exact spelling, so a lookup spelt exactly as a later key finds that
+// key. Internal to the INI model; owns its lines.
 
 #ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
 #define VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
@@ -16,6 +18,7 @@
 
 struct vxMappedINIFile::Section {
   using LineIndex = std::unordered_map<std::string_view, INILine*, vxini::FoldHash, vxini::FoldEqual>;
+  using ExactIndex = std::unordered_map<std::string_view, INILine*>;
 
   Section() = default;
   ~Section() {
@@ -31,11 +34,20 @@ struct vxMappedINIFile::Section {
   }
   void RebuildIndex() const {
     index.clear();
+    exact.clear();
     index.reserve(lines.size());
     for (INILine* line : lines) {
-      if (line != nullptr) index.emplace(line->LoadedKey(), line);  // the first one stays
+      if (line != nullptr) Index(line);
     }
     indexedCount = lines.size();
+  }
+  // The first line of a key stays the one found; a later one spelt otherwise is found by its
+  // exact spelling.
+  void Index(INILine* line) const {
+    auto [first, added] = index.emplace(line->LoadedKey(), line);
+    if (!added && first->second->LoadedKey() != line->LoadedKey()) {
+      exact.emplace(line->LoadedKey(), line);
+    }
   }
 
   // The header line is written as prefix + name + suffix + line end, so that an unchanged name
@@ -54,6 +66,7 @@ struct vxMappedINIFile::Section {
   std::string carriedTrailing;  // lines kept from removed property lines, written before those
 
   mutable LineIndex index;  // views into the lines' own immutable text
+  mutable ExactIndex exact;  // only keys that differ from an earlier key in case alone
   mutable size_t indexedCount = static_cast<size_t>(-1);
 };
 

@@ -125,7 +125,27 @@ INSTANTIATE_TEST_SUITE_P(
                     MergeFrom("[MAIN]\r\n; c\r\nK=src\r\nnew1 = a\r\nNEW1=dup\r\nnew2=b\r\n"
                               "[other]\r\nx=1\r\n[Main]\r\nhidden=1\r\n[third]\r\n"),
                     "[main]\nk=dest\nnew1 = a\nnew2=b\n; end of main\n\n[dest]\nd=1\n[other]\nx=1\n"
-                    "[third]\n"}),
+                    "[third]\n"},
+        // Keys and sections that differ in case alone keep their own values: the exact spelling
+        // finds its own line, any other spelling the first one.
+        RewriteCase{"ExactSpellingFindsItsOwnKey",
+                    "[Profile]\nLogFileUserName=server\nLogFileUsername=warehouse\nx=1\n",
+                    [](Ini& ini) {
+                      EXPECT_EQ("warehouse", ini.GetVal("Profile", "LogFileUsername").str());
+                      EXPECT_EQ("server", ini.GetVal("PROFILE", "LOGFILEUSERNAME").str());
+                      ini.SetVal("Profile", "LogFileUsername", vxStringBase("wh"));
+                      EXPECT_EQ(0, ini.RemoveKey("Profile", "LogFileUserName"));
+                      EXPECT_EQ("wh", ini.GetVal("profile", "logfileusername").str());
+                    },
+                    "[Profile]\nLogFileUsername=wh\nx=1\n"},
+        RewriteCase{"ExactSpellingFindsItsOwnSection", "[Main]\na=1\n[main]\na=2\n",
+                    [](Ini& ini) {
+                      EXPECT_EQ("1", ini.GetVal("MAIN", "a").str());
+                      ini.SetVal("main", "a", vxStringBase("3"));
+                      EXPECT_EQ(0, ini.RenameSection("Main", "Other"));
+                      EXPECT_EQ("3", ini.GetVal("MAIN", "a").str());
+                    },
+                    "[Other]\na=1\n[main]\na=3\n"}),
     [](const testing::TestParamInfo<RewriteCase>& info) { return info.param.name; });
 
 // Type and permission bits of whatever is at path (a link not followed); 0 when nothing is.
