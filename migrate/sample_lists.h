@@ -8,7 +8,8 @@
 // exclusion list of bare file names. product is a product id text ("halsuite", "obx", ...), kind a
 // profile or file type ("wlp" log-analysis profiles, "prx" proxy profiles, "slp" streaming
 // profiles, "llp" link profiles, "alp" alert profiles, "arp" auto-report profiles, "mss" report
-// templates). Both are matched ignoring case. "" when the product ships none of that kind.
+// templates, "wct" server report templates). Both are matched ignoring case. "" when the product
+// ships none of that kind.
 const char* GetSampleFileList(const char* product, const char* kind);
 
 #endif  // VXMIGRATE_MIGRATE_SAMPLE_LISTS_H_
