@@ -1,8 +1,7 @@
-// Steps shared by the migrations of the user's selected log, link and alert profiles (and by the
-// edition's profile conversion): the list of profiles left behind (unselected ones and the
-// product's samples), with a log line for every selected name that is not in the folder, the
-// version test that decides whether the profile kind keeps a categories file, and the home-page
-// split.
+// Steps shared by the migrations of the user's selected log, link and alert profiles: the list of
+// profiles left behind (unselected ones and the product's samples), with a log line for every
+// selected name that is not in the folder, and the version test that decides whether the profile
+// kind keeps a categories file. The home-page split is public (migrate/profile_rules.h).
 
 #ifndef VXMIGRATE_MIGRATE_INTERNAL_PROFILE_MIGRATION_H_
 #define VXMIGRATE_MIGRATE_INTERNAL_PROFILE_MIGRATION_H_
@@ -10,6 +9,7 @@
 #include "foundation/inifile/ini_file.h"
 #include "foundation/string/string_base.h"
 #include "foundation/string/version.h"
+#include "migrate/profile_rules.h"
 
 class vxMigrationManager;
 
@@ -30,10 +30,5 @@ void CategoriesVersion(int productID, bool firewallCounts, int& major, int& mino
 
 // Both installations reach their categories versions.
 bool BothKeepCategories(vxMigrationManager& manager, bool firewallCounts);
-
-// Splits "HomePageName" of section "Profile" into "HomePageBaseDir" (before its last "/") and
-// "HomePageDefaults" (after it): "a/b/index.htm" gives "a/b" and "index.htm"; without a "/" the
-// whole value is the folder and the page is empty. "HomePageName" stays; an empty one changes nothing.
-void SplitHomePage(vxMappedINIFile& profile);
 
 #endif  // VXMIGRATE_MIGRATE_INTERNAL_PROFILE_MIGRATION_H_

@@ -3,17 +3,18 @@
 // list, extension and fromInstallation, in constant average time instead of a walk of the list.
 // The index copies what it needs: the list and the manager may change afterwards.
 
-#ifndef VXMIGRATE_MIGRATE_INTERNAL_EXCLUSION_INDEX_H_
-#define VXMIGRATE_MIGRATE_INTERNAL_EXCLUSION_INDEX_H_
+#ifndef VXMIGRATE_MIGRATE_EXCLUSION_INDEX_H_
+#define VXMIGRATE_MIGRATE_EXCLUSION_INDEX_H_
 
 #include <string>
 #include <unordered_set>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
 class vxMigrationManager;
 
-class vxExclusionIndex {
+class VXM_EXPORT vxExclusionIndex {
  public:
   vxExclusionIndex(vxMigrationManager& manager, const vxStringBase& list,
                    const vxStringBase& inPlaceExtension, int fromInstallation);
@@ -29,11 +30,4 @@ class vxExclusionIndex {
   std::unordered_set<std::string> names_;  // candidates with ASCII case folded
 };
 
-// Turns one raw name of an exclusion list into the text a file is compared with: blanks around it
-// dropped, ".ini" replaced in an in-place run, joined to the source folder when fromInstallation
-// is nonzero. False for a name that is empty after stripping: it names no file.
-bool vxExclusionCandidate(vxMigrationManager& manager, vxStringBase name,
-                          const vxStringBase& inPlaceExtension, int fromInstallation,
-                          vxStringBase& candidate);
-
-#endif  // VXMIGRATE_MIGRATE_INTERNAL_EXCLUSION_INDEX_H_
+#endif  // VXMIGRATE_MIGRATE_EXCLUSION_INDEX_H_

@@ -2,8 +2,8 @@
 // symbolic link as a link; a settings file copied that way and then rewritten would be rewritten
 // through the link, in the installation it points into.
 
-#ifndef VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
-#define VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
+#ifndef VXMIGRATE_FOUNDATION_FILES_RESOLVED_PATH_H_
+#define VXMIGRATE_FOUNDATION_FILES_RESOLVED_PATH_H_
 
 #include <sys/stat.h>
 
@@ -24,4 +24,4 @@ inline vxStringBase ResolvedCopySource(const vxStringBase& path) {
   return result;
 }
 
-#endif  // VXMIGRATE_MIGRATE_INTERNAL_RESOLVED_PATH_H_
+#endif  // VXMIGRATE_FOUNDATION_FILES_RESOLVED_PATH_H_
