@@ -11,11 +11,13 @@
 #include <sys/stat.h>
 #include <sys/wait.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <map>
 #include <string>
+#include <vector>
 
 #include "support/test_files.h"
 
@@ -145,6 +147,26 @@ TEST_P(ShippedPluginAgain, SecondRunChangesOnlyTheLog) {
   first.erase("vxmigrate.log");
   second.erase("vxmigrate.log");
   EXPECT_EQ(second, first);
+}
+
+// A server already at version 3 upgraded again: the library's OBX conversion serves only sources
+// before version 3, so the plug-in says so and merges the query profiles as they are; converting
+// them would have emptied their pages.
+TEST(ObxUpgrade, FromVersionThreeKeepsQueryProfilesWhole) {
+  SampleRun run("obx_to_obx");
+  ASSERT_EQ(0, run.Run()) << ReadFile(run.Path("out.txt"));  // obx-2.5 into obx (3.0)
+  fs::copy(Source("samples/obx"), run.Path("obx-3.1"), fs::copy_options::recursive);
+  WriteFile(run.Path("migcmd.ini"),
+            "[main]\nD1=obx\nD2=obx-3.1\nP1=obx\nP2=obx\nV1=3.0\nV2=3.1\n\n[profiles]\nLog=\n");
+  ASSERT_EQ(0, run.Run()) << ReadFile(run.Path("out.txt"));
+
+  const std::string pages = "/vxm_vxx/datfiles/dynamicpages/default.ini";
+  EXPECT_EQ(ReadFile(run.Path("obx-3.1" + pages)), ReadFile(run.Path("obx" + pages)));
+  const std::vector<std::string> log = LogEntries(run.Path("obx-3.1/vxmigrate.log"));
+  EXPECT_NE(std::find(log.begin(), log.end(),
+                      "No functions exist for migration of specified products - check names, "
+                      "versions"),
+            log.end());
 }
 
 INSTANTIATE_TEST_SUITE_P(Samples, ShippedPlugin, ::testing::ValuesIn(kShippedPlugins));
