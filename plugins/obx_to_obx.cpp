@@ -11,22 +11,7 @@ namespace {
 const char kSettings[] = "\\vxm_vxx\\vxm_vxx.ini";
 const char kTemplates[] = "\\vxm_vxx";
 const char kLanguages[] = "\\vxm_vxx\\template";
-
-// The kinds that the OBX advanced-option operation handles, for a source already in the layout of
-// version 3: there every kind, query profiles included, merges entry by entry.
-struct AdvancedOptionFamily {
-  const char* file;
-  const char* prefix;
-};
-const AdvancedOptionFamily kAdvancedOptions[] = {
-    {"/vxm_vxx/datfiles/contentgroups/default.ini", "contentgroupprofile"},
-    {"/vxm_vxx/datfiles/pathsanalysis/default.ini", "pathsanalysisprofile"},
-    {"/vxm_vxx/datfiles/urlreplacement/default.ini", "urlreplacementprofile"},
-    {"/vxm_vxx/datfiles/tradequill/default.ini", "adcampaignprofile"},
-    {"/vxm_vxx/datfiles/tradequill/default.ini", "productprofile"},
-    {"/vxm_vxx/datfiles/tradequill/default.ini", "categoryprofile"},
-    {"/vxm_vxx/datfiles/dynamicpages/default.ini", "queryprofile"},
-};
+const char kDynamicPages[] = "/vxm_vxx/datfiles/dynamicpages/default.ini";
 
 int SourceMajor(vxMigrationManager* m) {
   const vxVersionDescriptor* version = m->GetSourceVersionDescriptor();
@@ -34,17 +19,15 @@ int SourceMajor(vxMigrationManager* m) {
 }
 
 // The library's OBX operation converts query profiles from the layout before version 3; reading a
-// source that already has the new layout that way would empty their pages. Such a source is
-// logged as a pair the conversion does not serve, and merged kind by kind instead.
+// source that already has the new layout that way would empty their pages. For such a source the
+// plug-in says the pair is served only in part and first merges the query profiles whole: the
+// conversion then finds each one present by its id and converts none.
 void MigrateAdvancedOptions(vxMigrationManager* m) {
-  if (SourceMajor(m) < 3) {
-    m->DoOBXMergeAdvancedOptionsFiles();
-    return;
+  if (SourceMajor(m) >= 3) {
+    m->DoBadMigration();
+    m->MergeAdvancedOptionsFiles(kDynamicPages, kDynamicPages, "queryprofile");
   }
-  m->DoBadMigration();
-  for (const AdvancedOptionFamily& family : kAdvancedOptions) {
-    m->MergeAdvancedOptionsFiles(family.file, family.file, family.prefix);
-  }
+  m->DoOBXMergeAdvancedOptionsFiles();
 }
 
 }  // namespace
