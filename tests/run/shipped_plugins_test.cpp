@@ -3,9 +3,6 @@
 // destination, log included, must come out as tests/run/golden/<plug-in> holds it; the source
 // must stay byte for byte; a fresh destination comes out the same; and a second run over the
 // migrated destination changes nothing but the log.
-//
-// Golden files are written, not compared, when VXM_UPDATE_GOLDEN=1; review their diff before
-// committing them.
 
 #include <gtest/gtest.h>
 #include <sys/stat.h>
@@ -111,6 +108,8 @@ std::string GoldenFolder(const std::string& plugin) {
   return Source("tests/run/golden/" + plugin);
 }
 
+// With VXM_UPDATE_GOLDEN=1 the test writes the golden files instead of comparing with them; their
+// diff is then reviewed before it is committed.
 void WriteGolden(const std::string& plugin, const Tree& files) {
   fs::remove_all(GoldenFolder(plugin));
   for (const auto& [name, content] : files) WriteFile(GoldenFolder(plugin) + "/" + name, content);
