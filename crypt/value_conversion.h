@@ -5,17 +5,18 @@
 #ifndef VXMIGRATE_CRYPT_VALUE_CONVERSION_H_
 #define VXMIGRATE_CRYPT_VALUE_CONVERSION_H_
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
 // Replaces a legacy-encoded value by the protected form of its clear text; a value already
 // protected, or empty, is left alone. 0 when done or nothing was to do; 1 when the value (1024
 // characters or more) or its protected form (clear text over 492 bytes) would not fit the working
 // buffers, or encryption failed: the value is then unchanged.
-int ConvertToProtectedValue(vxStringBase& value);
+VXM_EXPORT int ConvertToProtectedValue(vxStringBase& value);
 
 // Replaces a protected or previous-generation value by its clear text (a protected value that does
 // not decrypt becomes empty); any other value stays as it is. The clear text ends at its first zero
 // byte. 0 when done; 1 when the value has 1024 characters or more and was left unchanged.
-int DecryptToClearText(vxStringBase& value);
+VXM_EXPORT int DecryptToClearText(vxStringBase& value);
 
 #endif  // VXMIGRATE_CRYPT_VALUE_CONVERSION_H_

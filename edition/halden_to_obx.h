@@ -7,6 +7,7 @@
 #ifndef VXMIGRATE_EDITION_HALDEN_TO_OBX_H_
 #define VXMIGRATE_EDITION_HALDEN_TO_OBX_H_
 
+#include "foundation/export.h"
 #include "foundation/files/filename.h"
 #include "foundation/inifile/ini_file.h"
 #include "foundation/inifile/ini_line.h"
@@ -14,7 +15,7 @@
 
 class vxMigrationManager;
 
-class HaldenToOBXHelper {
+class VXM_EXPORT HaldenToOBXHelper {
  public:
   // REQUIRES: manager is valid and outlives the converter. Its folders are copied now; later
   // changes to the manager's folders do not reach the converter.

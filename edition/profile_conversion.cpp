@@ -12,13 +12,13 @@
 #include "edition/halden_to_obx.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/resolved_path.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/string/tokenizer.h"
-#include "migrate/internal/exclusion_index.h"
-#include "migrate/internal/failed_copy.h"
-#include "migrate/internal/profile_migration.h"
-#include "migrate/internal/resolved_path.h"
+#include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/manager.h"
+#include "migrate/profile_rules.h"
 #include "migrate/sample_lists.h"
 
 namespace {

@@ -17,7 +17,7 @@
 #include "edition/standard_templates.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
-#include "migrate/internal/resolved_path.h"
+#include "foundation/files/resolved_path.h"
 #include "migrate/manager.h"
 
 namespace {

@@ -9,7 +9,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_index.h"
+#include "migrate/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/manager.h"

@@ -6,9 +6,10 @@
 #ifndef VXMIGRATE_MIGRATE_CMDLINE_PARSER_H_
 #define VXMIGRATE_MIGRATE_CMDLINE_PARSER_H_
 
+#include "foundation/export.h"
 #include "foundation/files/command_line.h"
 
-class MigrationCmdLineParser : public vxCommandLineParser {
+class VXM_EXPORT MigrationCmdLineParser : public vxCommandLineParser {
  public:
   MigrationCmdLineParser(int argc, char** argv);
   ~MigrationCmdLineParser() override;

@@ -15,7 +15,7 @@
 #include "foundation/files/basic_file.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/string/tokenizer.h"
-#include "migrate/internal/failed_copy.h"
+#include "migrate/failed_copy.h"
 #include "migrate/manager.h"
 
 namespace {

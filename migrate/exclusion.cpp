@@ -3,7 +3,7 @@
 // match ignoring ASCII case. Nothing here touches the disk except the folder listing of
 // MakeFullExclusionList.
 
-#include "migrate/internal/exclusion_index.h"
+#include "migrate/exclusion_index.h"
 
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
@@ -30,8 +30,9 @@ class ExclusionListWalk {
   unsigned int position_ = 0;
 };
 
-}  // namespace
-
+// Turns one raw name of an exclusion list into the text a file is compared with: blanks around it
+// dropped, ".ini" replaced in an in-place run, joined to the source folder when fromInstallation
+// is nonzero. False for a name that is empty after stripping: it names no file.
 bool vxExclusionCandidate(vxMigrationManager& manager, vxStringBase name,
                           const vxStringBase& inPlaceExtension, int fromInstallation,
                           vxStringBase& candidate) {
@@ -52,6 +53,8 @@ bool vxExclusionCandidate(vxMigrationManager& manager, vxStringBase name,
   }
   return true;
 }
+
+}  // namespace
 
 vxExclusionIndex::vxExclusionIndex(vxMigrationManager& manager, const vxStringBase& list,
                                    const vxStringBase& inPlaceExtension, int fromInstallation) {

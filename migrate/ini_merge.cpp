@@ -8,8 +8,8 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_index.h"
-#include "migrate/internal/failed_copy.h"
+#include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 

@@ -7,7 +7,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/failed_copy.h"
+#include "migrate/failed_copy.h"
 #include "migrate/manager.h"
 
 namespace {

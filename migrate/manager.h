@@ -16,6 +16,7 @@
 #include <memory>
 #include <string>
 
+#include "foundation/export.h"
 #include "foundation/files/log_file.h"
 #include "foundation/string/string_base.h"
 #include "foundation/string/version.h"
@@ -43,7 +44,7 @@ typedef int (*vxMigrateInitializeEntry)(vxMigrateInfo* info);
 typedef int (*vxMigrateEntry)(vxMigrationManager* manager);
 }
 
-class vxMigrationManager {
+class VXM_EXPORT vxMigrationManager {
  public:
   // Builds the run from the host's arguments, falling back on "migcmd.ini" when the command line
   // is incomplete. An incomplete run leaves IsValid() false and writes nothing anywhere. The run

@@ -7,10 +7,10 @@
 
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/resolved_path.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
-#include "migrate/internal/exclusion_index.h"
-#include "migrate/internal/resolved_path.h"
+#include "migrate/exclusion_index.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
 

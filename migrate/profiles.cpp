@@ -10,7 +10,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
 #include "foundation/string/tokenizer.h"
-#include "migrate/internal/exclusion_index.h"
+#include "migrate/exclusion_index.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 

@@ -17,7 +17,8 @@ struct SampleList {
 };
 
 // wlp log-analysis profiles, prx proxy and firewall profiles, slp streaming-media profiles,
-// llp link-check profiles, alp alert profiles, arp auto-report profiles, mss report templates.
+// llp link-check profiles, alp alert profiles, arp auto-report profiles, mss report templates,
+// wct the reporting server's report templates.
 const SampleList kSampleLists[] = {
     {"halsuite", "wlp", "sample.wlp,demo_site.wlp,intranet.wlp,ecommerce_demo.wlp"},
     {"halsuite", "prx", "sample_proxy.prx,firewall_demo.prx"},
@@ -50,6 +51,7 @@ const SampleList kSampleLists[] = {
     {"obx", "alp", "obx_sample_alert.alp"},
     {"obx", "arp", "obx_daily.arp,obx_monthly.arp"},
     {"obx", "mss", "obx_standard.mss,obx_executive.mss"},
+    {"obx", "wct", "CompleteSummary.wct"},
 
     {"tqrs", "wlp", "tqrs_sample.wlp,tqrs_demo.wlp"},
     {"tqrs", "arp", "tqrs_daily.arp"},

@@ -1,6 +1,6 @@
 // Shipped migration plug-in: a Halden installation ("halsuite") into an OBX reporting server
-// ("obx"). The conversion itself is the library's edition converter; this file only declares the
-// pair of products and runs it.
+// ("obx"). The conversion itself is the library's edition converter; after it come the user's
+// language files, which the converted templates name under the server's template folder.
 
 #include "edition/halden_to_obx.h"
 #include "migrate/manager.h"
@@ -15,5 +15,6 @@ extern "C" int MigrateInitialize(vxMigrateInfo* info) {
 extern "C" int Migrate(vxMigrationManager* manager) {
   HaldenToOBXHelper converter(manager);
   converter.DoHaldenToOBXMigrate();
+  manager->DoCopyLanguageFiles("\\vxm_log\\template", "\\vxm_vxx\\template");
   return 0;
 }

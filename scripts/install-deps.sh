@@ -3,7 +3,7 @@
 # i386 and under the sanitizers. Safe to run again: it installs only missing packages.
 set -euo pipefail
 
-packages=(cmake ninja-build g++ g++-multilib nettle-dev nettle-dev:i386 libgtest-dev
+packages=(cmake ninja-build g++ g++-multilib pkgconf nettle-dev nettle-dev:i386 libgtest-dev
           libgtest-dev:i386 libbenchmark-dev)
 
 sudo_cmd=()

@@ -7,9 +7,10 @@
 
 #include <string>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxBasicFile {
+class VXM_EXPORT vxBasicFile {
  public:
   // openFlags and accessMode are open(2) flags, or-ed together (the callers pass 2 = O_RDWR, and
   // 0x240 = O_CREAT | O_TRUNC with 2). permissions is the mode of a newly created file (0: 0666

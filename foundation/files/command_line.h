@@ -10,9 +10,10 @@
 #include <string>
 #include <vector>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxCommandLineParser {
+class VXM_EXPORT vxCommandLineParser {
  public:
   // Keeps copies of the arguments (argv[0] is the program name and is not an option).
   vxCommandLineParser(int argc, char** argv, char optionChar, char separator);

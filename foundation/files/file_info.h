@@ -8,9 +8,10 @@
 #include <cstdint>
 #include <vector>
 
+#include "foundation/export.h"
 #include "foundation/files/filename.h"
 
-class vxFileInfo {
+class VXM_EXPORT vxFileInfo {
  public:
   // Reads the entry's attributes; followLinks chooses stat over lstat. A missing entry gives
   // Exists() false and a mode of 0.

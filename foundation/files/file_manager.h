@@ -8,11 +8,12 @@
 
 #include <vector>
 
+#include "foundation/export.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/filename.h"
 #include "foundation/string/string_base.h"
 
-class vxFileManager {
+class VXM_EXPORT vxFileManager {
  public:
   // The platform's path separator.
   static const char m_slash;

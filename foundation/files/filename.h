@@ -4,9 +4,10 @@
 #ifndef VXMIGRATE_FOUNDATION_FILES_FILENAME_H_
 #define VXMIGRATE_FOUNDATION_FILES_FILENAME_H_
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxFilename {
+class VXM_EXPORT vxFilename {
  public:
   vxFilename();
   explicit vxFilename(const char* path);  // null gives an empty path

@@ -8,11 +8,12 @@
 
 #include <string>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
 enum LogLevel { kLogNone = 0, kLogNormal = 1, kLogDetail = 2 };
 
-class vxLogFile {
+class VXM_EXPORT vxLogFile {
  public:
   // mode 1 starts a new log (an older one of the same name is replaced); 0 appends to it.
   vxLogFile(const vxStringBase& filename, unsigned int mode);

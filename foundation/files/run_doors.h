@@ -15,9 +15,10 @@
 #include <string_view>
 #include <unordered_map>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxRunDoors {
+class VXM_EXPORT vxRunDoors {
  public:
   // Receives every refusal as an "Error: " text and the path it concerns.
   using Reporter = std::function<void(const char* text, const char* path)>;
@@ -86,9 +87,9 @@ class vxRunDoors {
 
 // The checks of the current doors for the file layer; each admits everything outside a run.
 namespace vxfiles {
-bool MayWrite(std::string_view path);
-bool MayWriteInto(std::string_view folder);
-bool MayRead(std::string_view path);
+VXM_EXPORT bool MayWrite(std::string_view path);
+VXM_EXPORT bool MayWriteInto(std::string_view folder);
+VXM_EXPORT bool MayRead(std::string_view path);
 }  // namespace vxfiles
 
 #endif  // VXMIGRATE_FOUNDATION_FILES_RUN_DOORS_H_

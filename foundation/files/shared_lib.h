@@ -4,9 +4,10 @@
 #ifndef VXMIGRATE_FOUNDATION_FILES_SHARED_LIB_H_
 #define VXMIGRATE_FOUNDATION_FILES_SHARED_LIB_H_
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxSharedLib {
+class VXM_EXPORT vxSharedLib {
  public:
   explicit vxSharedLib(const char* path);
   virtual ~vxSharedLib();  // unloads

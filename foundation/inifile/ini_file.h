@@ -14,11 +14,12 @@
 #include <unordered_map>
 #include <vector>
 
+#include "foundation/export.h"
 #include "foundation/inifile/ini_line.h"
 #include "foundation/inifile/ini_text.h"
 #include "foundation/string/string_base.h"
 
-class vxMappedINIFile {
+class VXM_EXPORT vxMappedINIFile {
  public:
   vxMappedINIFile();
   explicit vxMappedINIFile(const char* filename);

@@ -11,10 +11,11 @@
 #include <string_view>
 #include <vector>
 
+#include "foundation/export.h"
 #include "foundation/inifile/ini_text.h"
 #include "foundation/string/string_base.h"
 
-class INILine {
+class VXM_EXPORT INILine {
  public:
   INILine(const vxStringBase& key, const vxStringBase& value);
   INILine(const INILine& other);             // a full copy, layout included

@@ -9,7 +9,9 @@
 #include <string>
 #include <string_view>
 
-class vxStringBase {
+#include "foundation/export.h"
+
+class VXM_EXPORT vxStringBase {
  public:
   // Result of a search that found nothing: the largest unsigned value, so "position < 2" excludes it.
   static const unsigned int BadIndex;
@@ -102,8 +104,8 @@ class vxStringBase {
 };
 
 // ASCII case folding shared by every case-insensitive comparison and index.
-char vxFoldCase(char c);
-std::string vxFoldCase(std::string_view text);
-bool vxEqualsIgnoreCase(std::string_view a, std::string_view b);
+VXM_EXPORT char vxFoldCase(char c);
+VXM_EXPORT std::string vxFoldCase(std::string_view text);
+VXM_EXPORT bool vxEqualsIgnoreCase(std::string_view a, std::string_view b);
 
 #endif  // VXMIGRATE_FOUNDATION_STRING_STRING_BASE_H_

@@ -6,9 +6,10 @@
 
 #include <string>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxBStringTokenizer {
+class VXM_EXPORT vxBStringTokenizer {
  public:
   // The list separator of comma-separated lists: ",".
   static const char* const m_csvToken;

@@ -6,9 +6,10 @@
 
 #include <cstdint>
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxVersionDescriptor {
+class VXM_EXPORT vxVersionDescriptor {
  public:
   explicit vxVersionDescriptor(const char* text);
   explicit vxVersionDescriptor(const vxStringBase& text);

@@ -46,7 +46,7 @@ TEST(HostReport, NoticesGoToStandardErrorAndTheSummaryCountsTheRun) {
             "** OBX does not support new day/time filters - MUST manually change: Weekend visitors\n",
             run.Err());
   EXPECT_EQ("Plug-in:              " + run.bin + "/halden_to_obx.so\n"
-            "Files copied:         0\n"
+            "Files copied:         1\n"
             "INI files merged:     8\n"
             "Templates converted:  2\n"
             "Profiles converted:   2\n"

@@ -1,0 +1,5 @@
+[SaveAs]
+SaveReportAs=weekly_report.htm
+
+[general]
+description=Weekly traffic for the shop

@@ -1,0 +1,2 @@
+[SaveAs]
+SaveReportAs=standard.htm

@@ -1,0 +1,5 @@
+[SaveAs]
+SaveReportAs=standard.htm
+
+[general]
+description=Standard report
