@@ -2,13 +2,13 @@
 // value is spliced into its line between the line's own spacing, and new lines end like the file's
 // first line. Close(1) never replaces an existing file this object did not load.
 
-#include "foundation/inifile/ini_disk.h"
+#include "foundation/files/atomic_file.h"
 #include "foundation/inifile/ini_file.h"
 #include "foundation/inifile/ini_section.h"
 
 class INIFileWriter {
  public:
-  INIFileWriter(const vxMappedINIFile& file, vxini::AtomicFileWriter& out)
+  INIFileWriter(const vxMappedINIFile& file, vxfiles::AtomicFileWriter& out)
       : file_(file), out_(out), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
     if (file.text_) text_ = *file.text_;
     buffer_.reserve(kChunk + 4096);
@@ -37,7 +37,7 @@ class INIFileWriter {
   }
 
   const vxMappedINIFile& file_;
-  vxini::AtomicFileWriter& out_;
+  vxfiles::AtomicFileWriter& out_;
   std::string_view fileEol_;
   std::string_view text_;
   std::string buffer_;
@@ -100,10 +100,10 @@ bool INIFileWriter::Render() {
 int vxMappedINIFile::Write(bool flushToDisk) {
   int result = 1;
   try {
-    vxini::ReplaceTarget target;
+    vxfiles::ReplaceTarget target;
     // An existing file that was never loaded (or failed to load) is not ours to replace.
-    if (vxini::ResolveReplaceTarget(filename_.str(), &target) && (loaded_ || !target.exists)) {
-      vxini::AtomicFileWriter out;
+    if (vxfiles::ResolveReplaceTarget(filename_.str(), &target) && (loaded_ || !target.exists)) {
+      vxfiles::AtomicFileWriter out;
       INIFileWriter writer(*this, out);
       if (out.Begin(target) && writer.Render() && out.Commit(flushToDisk)) result = 0;
     }
