@@ -23,7 +23,7 @@ constexpr size_t kMaxFileSize = UINT32_MAX - 1;
 
 }  // namespace
 
-bool ReadWholeFile(const std::string& path, std::string* text) {
+bool ReadWholeFile(const std::string& path, std::string* text, mode_t* mode) {
   text->clear();
   if (!vxfiles::MayRead(path)) return false;
   // Non-blocking, so that a pipe given as a settings file cannot stall the run before the check.
@@ -34,6 +34,7 @@ bool ReadWholeFile(const std::string& path, std::string* text) {
     close(fd);
     return false;
   }
+  if (mode != nullptr) *mode = st.st_mode & 07777;
   // One byte more than the size, so that a file that grew since fstat is noticed and read whole.
   text->resize(static_cast<size_t>(st.st_size) + 1);
   size_t filled = 0;
