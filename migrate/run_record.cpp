@@ -235,16 +235,14 @@ void vxRunRecord::NoteEntry(const std::string& entry) {
     }
     std::string relative;
     if (DestinationRelative(named, relative)) {
-      Touch(relative).merged = true;
+      mergedNamed_.insert(relative);
     } else if (Below(RealEntry(named), sourceReal_, relative)) {
       for (auto& [path, file] : files_) {
         if (file.source == relative) file.merged = true;
       }
     }
   }
-  if (entry == "keywords.ini merged" && files_.count("keywords.ini") != 0) {
-    files_["keywords.ini"].merged = true;
-  }
+  if (entry == "keywords.ini merged") mergedNamed_.insert("keywords.ini");
   const char kExists[] = "File exists - no copy made:";
   if (StartsWith(entry, kExists)) {
     std::string relative;
@@ -285,7 +283,7 @@ std::string vxRunRecord::Action(const std::string& relative, const FileRecord& f
     return "kept";
   }
   if (file.converted) return "converted";
-  return file.merged ? "merged" : "replaced";
+  return file.merged || mergedNamed_.count(relative) != 0 ? "merged" : "replaced";
 }
 
 std::string vxRunRecord::ReportText(const std::string& plugin) {

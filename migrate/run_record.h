@@ -13,6 +13,7 @@
 
 #include <map>
 #include <memory>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -73,6 +74,7 @@ class vxRunRecord : public vxWriteObserver {
   std::vector<std::unique_ptr<MergeRecord>> merges_;
   std::vector<std::string> notices_, errors_;
   std::string lastSourceRead_;
+  std::set<std::string> mergedNamed_;  // files that merges writing them by themselves named
 };
 
 // The text a report shows for a value: "<protected>" for a stored password or user name (a value
