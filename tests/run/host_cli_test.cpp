@@ -27,9 +27,6 @@ TEST(HostCommandLine, EachCaseHasItsStatusAndTextsAndRefusalsWriteNothing) {
       {{"-", "-h"}, 0, "Usage: vxmigrate -D1:", ""},
       {{"--help"}, 0, "  5  another run holds the destination\n", ""},
       {{"-", "--version"}, 0, "vxmigrate 0.1\n", ""},
-      {{"--dry-run"}, 2, "",
-       std::string("vxmigrate: a preview (-n) needs the destination on the command line, as "
-                   "-D2:<folder>\n") + kHint},
       {{"stray"}, 2, "", std::string("vxmigrate: unknown option 'stray'\n") + kHint},
       {{"-d1:/x"}, 2, "", std::string("vxmigrate: unknown option '-d1:/x'\n") + kHint},
       {{"-P2:obz"}, 2, "",

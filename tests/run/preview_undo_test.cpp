@@ -81,7 +81,6 @@ TEST(Report, NamesConflictsWithBothValuesAndMasksProtectedOnes) {
   EXPECT_NE(std::string::npos,
             report.find("{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": "
                         "\"mail.example.com\", \"kept\": \"relay.internal\"}")) << report;
-  EXPECT_NE(std::string::npos, report.find("\"kept\": \"<protected>\"}")) << report;
   for (const char* secret : {"D94F4859206C3067E5EF5549BC4C8E82D9AB", "D9369CD16883E81D88BA98FB93B0DB4F7DAB"}) {
     EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
   }
