@@ -91,7 +91,7 @@ int HaldenToOBXHelper::DoVXMLogINIMigrate() {
   }
   const bool bothOpen = destination.Open(1) == 0;
 
-  destination.MergeFrom(source);
+  destination.MergeFrom(source, manager_->RecordMerge(sourcePath, destinationPath));
 
   if (bothOpen) {
     for (const char* key : {"DownloadTypes", "DocumentTypes"}) {

@@ -6,6 +6,7 @@
 
 #include <strings.h>
 
+#include <algorithm>
 #include <cstring>
 
 #include "host/usage.h"
@@ -96,12 +97,44 @@ HostOptions ReadHostOptions(int argc, char** argv) {
     }
   }
 
+  // The commands about a destination's past runs take the destination and nothing else.
+  for (int i = 1; i < argc; ++i) {
+    const std::string argument = argv[i];
+    HostAction action = argument == "--report"      ? HostAction::kReport
+                        : argument == "--undo"      ? HostAction::kUndo
+                        : argument == "--list-runs" ? HostAction::kListRuns
+                                                    : HostAction::kMigrate;
+    if (action == HostAction::kMigrate) continue;
+    std::vector<std::string> rest;
+    for (int j = 1; j < argc; ++j) {
+      if (j != i) rest.push_back(argv[j]);
+    }
+    if (action == HostAction::kUndo && !rest.empty() &&
+        std::find(rest.begin(), rest.end(), "--force") != rest.end()) {
+      options.force = true;
+      rest.erase(std::find(rest.begin(), rest.end(), "--force"));
+    }
+    if (i + 1 >= argc || rest.size() != 1 || rest[0] != argv[i + 1] || rest[0].empty()) {
+      options.error = "vxmigrate: " + argument + " takes one destination folder" +
+                      (action == HostAction::kUndo ? " (and --force)" : "") + "\n" + kHostHint;
+      options.action = HostAction::kUsageError;
+      return options;
+    }
+    options.destination = rest[0];
+    options.action = action;
+    return options;
+  }
+
   options.managerArguments.push_back(argc > 0 ? argv[0] : nullptr);
   std::string given = " ";
   for (int i = 1; i < argc; ++i) {
     const std::string argument = argv[i];
     if (argument == "-q" || argument == "-v") {
       options.verbosity = argument == "-q" ? Verbosity::kQuiet : Verbosity::kVerbose;
+      continue;
+    }
+    if (argument == "-n" || argument == "--dry-run") {
+      options.action = HostAction::kPreview;
       continue;
     }
     bool known = false;
@@ -112,6 +145,10 @@ HostOptions ReadHostOptions(int argc, char** argv) {
       const std::string value = split == std::string::npos ? "" : argument.substr(split + 1);
       options.error = CheckValue(argument, name, value, &known);
       given += name + " ";
+      if (name == "D2") {
+        options.destination = value;
+        options.destinationArgument = options.managerArguments.size();
+      }
     }
     if (!known) options.error = "vxmigrate: unknown option '" + argument + "'\n";
     if (!options.error.empty()) {
@@ -125,6 +162,10 @@ HostOptions ReadHostOptions(int argc, char** argv) {
     if (given.find(std::string(" ") + name + " ") != std::string::npos) continue;
     if (!options.missingRunOptions.empty()) options.missingRunOptions += ", ";
     options.missingRunOptions += std::string("-") + name;
+  }
+  if (options.action == HostAction::kPreview && options.destinationArgument == 0) {
+    options.error = std::string("vxmigrate: a preview (-n) needs the destination on the command line, as -D2:<folder>\n") + kHostHint;
+    options.action = HostAction::kUsageError;
   }
   return options;
 }

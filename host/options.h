@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-enum class HostAction { kMigrate, kHelp, kVersion, kUsageError };
+enum class HostAction { kMigrate, kPreview, kReport, kUndo, kListRuns, kHelp, kVersion, kUsageError };
 enum class Verbosity { kQuiet, kNormal, kVerbose };
 
 struct HostOptions {
@@ -20,6 +20,11 @@ struct HostOptions {
   std::string error;
   // The run options ("-D1" ... "-V2") the command line lacks; the command file may give them.
   std::string missingRunOptions;
+  // For kPreview: the destination as "-D2" gives it, and its index in managerArguments.
+  std::string destination;
+  size_t destinationArgument = 0;
+  // For kReport, kUndo, kListRuns: the destination folder named after the option.
+  bool force = false;  // --undo --force: also when files changed since the run
 };
 
 // REQUIRES: argv holds argc texts.

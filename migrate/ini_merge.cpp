@@ -66,7 +66,7 @@ int vxMigrationManager::MergeINIFiles(const char* sourceFile, const char* destin
     Log(kUnableToOpen, destination.Pathname().c_str());
     return 1;
   }
-  newSettings.MergeFrom(oldSettings);
+  newSettings.MergeFrom(oldSettings, RecordMerge(source.Pathname(), destination.Pathname()));
   oldSettings.Close(0);
   if (newSettings.Close(1) != 0) {
     Log(kUnableToOpen, destination.Pathname().c_str());

@@ -17,7 +17,9 @@
 #include "foundation/files/folder_lock.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/shared_lib.h"
+#include "foundation/inifile/ini_disk.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/run_record.h"
 #include "src/proc2/proc2.h"
 
 namespace {
@@ -53,6 +55,12 @@ vxMigrationManager::vxMigrationManager(int argc, char** argv, const vxStringBase
   Start(argc, argv);
 }
 
+vxMigrationManager::vxMigrationManager(int argc, char** argv, const vxRunSettings& settings)
+    : m_settings(settings) {
+  FindExecutable();
+  Start(argc, argv);
+}
+
 void vxMigrationManager::Start(int argc, char** argv) {
   m_cmdLineParser = new MigrationCmdLineParser(argc, argv);
   m_cmdLineParser->ParseCommand();
@@ -81,6 +89,7 @@ void vxMigrationManager::Start(int argc, char** argv) {
 }
 
 vxMigrationManager::~vxMigrationManager() {
+  if (m_record != nullptr && !m_finished) FinishRun(m_result);
   delete m_log;
   m_doors.reset();
   delete m_sourceVersionDescriptor;
@@ -110,6 +119,7 @@ void vxMigrationManager::Log(const char* text, const char* value) {
 // report must not depend on the log's disk.
 void vxMigrationManager::NoteEntry(const std::string& entry) {
   m_counts.Count(entry);
+  if (m_record != nullptr) m_record->NoteEntry(entry);
   if (m_listener != nullptr) m_listener->OnLogEntry(entry);
 }
 
@@ -173,10 +183,58 @@ void vxMigrationManager::OpenDoorsAndLog() {
   m_doors = std::make_unique<vxRunDoors>(
       m_sourceDirectory, m_destinationDirectory,
       [this](const char* text, const char* path) { Log(text, path); });
+  // The record watches from the first write on, the log's included, so that undo gives the old
+  // log back.
+  if (m_settings.keepJournal || m_settings.writeReport) {
+    m_record = std::make_unique<vxRunRecord>(
+        m_sourceDirectory.str(), m_destinationDirectory.str(),
+        m_settings.shownDestination.empty() ? m_destinationDirectory.str()
+                                            : m_settings.shownDestination,
+        m_settings.keepJournal);
+    m_doors->SetObserver(m_record.get());
+  }
   vxStringBase path;
   vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
   m_log = new vxLogFile(path, 1);
   WriteHeader(nullptr);
+  if (m_settings.keepJournal && m_record != nullptr && m_record->Journal() == nullptr &&
+      m_log->IsOpen()) {
+    Log("** No undo journal could be kept; this run cannot be undone: ",
+        m_destinationDirectory.c_str());
+  }
+}
+
+vxIniMergeObserver* vxMigrationManager::RecordMerge(const vxStringBase& source,
+                                                    const vxStringBase& destination) {
+  return m_record == nullptr ? nullptr : m_record->Merge(source.str(), destination.str());
+}
+
+std::string vxMigrationManager::GetReportPath() const {
+  if (m_record == nullptr || !m_settings.writeReport) return "";
+  vxStringBase path;
+  vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kRunReportName);
+  return path.str();
+}
+
+std::string vxMigrationManager::GetRunId() const {
+  return m_record != nullptr && m_record->Journal() != nullptr ? m_record->Journal()->Id() : "";
+}
+
+// The report goes through the doors like any other write (so undo takes it back too), atomically.
+void vxMigrationManager::FinishRun(int status) {
+  if (m_record == nullptr || m_finished) return;
+  m_finished = true;
+  const std::string path = GetReportPath();
+  if (!path.empty() && m_log != nullptr && m_log->IsOpen()) {
+    const std::string text = m_record->ReportText(m_pluginSearch.ran);
+    vxini::ReplaceTarget target;
+    vxini::AtomicFileWriter writer;
+    if (!vxini::ResolveReplaceTarget(path, &target) || !writer.Begin(target) ||
+        !writer.Append(text) || !writer.Commit(false)) {
+      Log("Error: Unable to write file:   ", path.c_str());
+    }
+  }
+  if (m_record->Journal() != nullptr) m_record->Journal()->Finish(status);
 }
 
 // The header's nine entries: into the log (listener null), or told to a listener that arrives
@@ -207,6 +265,7 @@ int vxMigrationManager::DoMigration() {
   int result = DoCheckMigrateValidity();
   if (result != 0) {
     Log(kPointerLine, m_log->GetFilename().c_str());
+    m_result = result;
     return result;
   }
   bool found = false;

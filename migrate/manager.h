@@ -37,6 +37,17 @@ struct vxMigrateInfo {
 class vxMigrationManager;
 class vxFolderLock;
 class vxRunDoors;
+class vxRunRecord;
+class vxIniMergeObserver;
+
+// What a run keeps besides its log; a host asks for these, a plug-in's tests need not.
+struct vxRunSettings {
+  bool keepJournal = false;  // an undo journal under the destination's ".vxmigrate"
+  bool writeReport = false;  // "vxmigrate-report.json" beside the log
+  // How the report names the destination; empty: as given ("-D2"). A preview runs in a scratch
+  // copy and names the real destination.
+  std::string shownDestination;
+};
 
 // The two entry points a migration plug-in exports with C linkage. Their results are ignored.
 extern "C" {
@@ -55,6 +66,8 @@ class VXM_EXPORT vxMigrationManager {
   // The same, for a host that keeps its plug-ins and "vxmigrate.ini" beside another executable
   // path (an embedding program, the tests).
   vxMigrationManager(int argc, char** argv, const vxStringBase& executable);
+  // As the first constructor, keeping what settings ask for.
+  vxMigrationManager(int argc, char** argv, const vxRunSettings& settings);
   virtual ~vxMigrationManager();
 
   vxMigrationManager(const vxMigrationManager&) = delete;
@@ -79,6 +92,15 @@ class VXM_EXPORT vxMigrationManager {
   void SetRunListener(vxRunListener* listener);
   const vxRunCounts& GetRunCounts() const { return m_counts; }
   const vxPluginSearch& GetPluginSearch() const { return m_pluginSearch; }
+  // The observer for one INI merge of source into destination, for the run's report; null when
+  // the run keeps no report.
+  vxIniMergeObserver* RecordMerge(const vxStringBase& source, const vxStringBase& destination);
+  // Writes the report and closes the journal with the run's final status. Called once; the
+  // destructor calls it with DoMigration's result when the host did not.
+  void FinishRun(int status);
+  // The report's path ("" when the run keeps none) and the journal's run id ("" when none).
+  std::string GetReportPath() const;
+  std::string GetRunId() const;
 
   MigrationCmdLineParser* GetCmdLineParser() { return m_cmdLineParser; }
   vxStringBase& GetSourceVersion() { return m_sourceVersion; }
@@ -214,6 +236,10 @@ class VXM_EXPORT vxMigrationManager {
   vxRunCounts m_counts;
   vxPluginSearch m_pluginSearch;
   vxRunListener* m_listener = nullptr;
+  vxRunSettings m_settings;
+  std::unique_ptr<vxRunRecord> m_record;
+  bool m_finished = false;
+  int m_result = 0;
 };
 
 #endif  // VXMIGRATE_MIGRATE_MANAGER_H_

@@ -80,7 +80,7 @@ int vxBasicFile::Open() {
     fd_ = OpenRewrite(name_, flags, permissions, tempName_);
     return fd_ >= 0 ? 0 : 1;
   }
-  if (!vxfiles::MayRead(name_) || (access != O_RDONLY && !vxfiles::MayWrite(name_))) return 1;
+  if (!vxfiles::MayRead(name_) || (access != O_RDONLY && !vxfiles::MayWriteInPlace(name_))) return 1;
   // Non-blocking until it is known to be a regular file: opening a pipe for reading would wait
   // for a writer, and reading a pipe or a device might never end.
   fd_ = open(name_.c_str(), flags | O_NONBLOCK, permissions);

@@ -16,6 +16,7 @@
 #include <cerrno>
 #include <cstddef>
 #include <cstring>
+#include <string_view>
 
 namespace vxfiles {
 
@@ -49,6 +50,8 @@ bool ReadDirEntries(int fd, std::vector<DirEntry>& entries, std::vector<char>& b
       offset += length;
       if (nameLength == 0) continue;
       if (name[0] == '.' && (nameLength == 1 || (nameLength == 2 && name[1] == '.'))) continue;
+      // The runs' own history is no installation file: no listing or copy ever meets it.
+      if (std::string_view(name, nameLength) == kRunHistoryFolder) continue;
       entries.push_back(DirEntry{std::string(name, nameLength), type});
     }
   }

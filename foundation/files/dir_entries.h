@@ -1,6 +1,6 @@
 // Reading one folder's entries through an open descriptor, shared by the listings and the copies.
 // Names come back sorted bytewise with the type the file system reported; "." and ".." are left
-// out. Internal to foundation/files.
+// out, and so is the runs' history folder. Internal to foundation/files.
 
 #ifndef VXMIGRATE_FOUNDATION_FILES_DIR_ENTRIES_H_
 #define VXMIGRATE_FOUNDATION_FILES_DIR_ENTRIES_H_
@@ -17,6 +17,10 @@ struct DirEntry {
   std::string name;
   unsigned char type;  // DT_DIR, DT_REG, DT_LNK, ... or DT_UNKNOWN when the file system won't say
 };
+
+// The folder at the top of a destination where runs keep their journals (see run_journal.h).
+// Listings and copies leave every entry of this name out.
+constexpr char kRunHistoryFolder[] = ".vxmigrate";
 
 // Reads every entry of the folder open at fd (which stays open and is the caller's) into entries,
 // sorted by name. buffer is scratch space the caller may reuse between calls. false when the

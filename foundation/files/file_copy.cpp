@@ -186,6 +186,7 @@ Outcome WriteDestination(CopyJob& job, const Source& src, int dstDirFd, const ch
                          bool destFresh) {
   Outcome gate = CheckDestination(job, dstDirFd, name, src, destFresh);
   if (gate != Outcome::kCopied) return gate;
+  if (!vxfiles::MayWriteAt(dstDirFd, name)) return Outcome::kFailed;
   std::string temp;
   bool written = WriteTemp(job, src, dstDirFd, name, temp);
   if (written && vxfiles::CommitTempAt(dstDirFd, temp.c_str(), name, job.replace) == 0) {
@@ -238,7 +239,7 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   job.destPath.append("/").append(name);
   // Made private while it fills (a read-only source folder must not lock us out of its copy);
   // its own mode and times follow once it is complete.
-  bool fresh = mkdirat(dstParent, name, 0700) == 0;
+  bool fresh = vxfiles::MayWriteAt(dstParent, name) && mkdirat(dstParent, name, 0700) == 0;
   int dstFd = (fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder | O_NOFOLLOW) : -1;
   // An existing destination folder that is a link is written through only when it leads to a
   // folder inside the destination installation.

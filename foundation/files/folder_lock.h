@@ -5,9 +5,10 @@
 #ifndef VXMIGRATE_FOUNDATION_FILES_FOLDER_LOCK_H_
 #define VXMIGRATE_FOUNDATION_FILES_FOLDER_LOCK_H_
 
+#include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
-class vxFolderLock {
+class VXM_EXPORT vxFolderLock {
  public:
   enum Result { kLocked, kBusy, kNoFolder };
 

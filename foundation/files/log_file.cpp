@@ -29,7 +29,7 @@ std::string TimeStamp() {
 
 vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
   int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
-  if (!vxfiles::MayWrite(filename_.view())) {  // no log where the run may not write
+  if (!vxfiles::MayWriteInPlace(filename_.view())) {  // no log where the run may not write
     openError_ = EPERM;
     return;
   }

@@ -242,19 +242,45 @@ bool vxRunDoors::JoinBeneath(vxStringBase& result, const vxStringBase& folder,
 
 namespace vxfiles {
 
+namespace {
+
+bool Observed(vxRunDoors* doors, std::string_view path, vxWriteObserver::Change change) {
+  vxWriteObserver* observer = doors->Observer();
+  return observer == nullptr || observer->BeforeWrite(path, change);
+}
+
+}  // namespace
+
 bool MayWrite(std::string_view path) {
   vxRunDoors* doors = vxRunDoors::Current();
-  return doors == nullptr || doors->AdmitWrite(path);
+  return doors == nullptr ||
+         (doors->AdmitWrite(path) && Observed(doors, path, vxWriteObserver::Change::kEntry));
+}
+
+bool MayWriteInPlace(std::string_view path) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  return doors == nullptr ||
+         (doors->AdmitWrite(path) && Observed(doors, path, vxWriteObserver::Change::kInPlace));
 }
 
 bool MayWriteInto(std::string_view folder) {
   vxRunDoors* doors = vxRunDoors::Current();
-  return doors == nullptr || doors->AdmitWriteInto(folder);
+  return doors == nullptr || (doors->AdmitWriteInto(folder) &&
+                              Observed(doors, folder, vxWriteObserver::Change::kInto));
+}
+
+bool MayWriteAt(int dirFd, const char* name) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  vxWriteObserver* observer = doors == nullptr ? nullptr : doors->Observer();
+  return observer == nullptr || observer->BeforeWriteAt(dirFd, name);
 }
 
 bool MayRead(std::string_view path) {
   vxRunDoors* doors = vxRunDoors::Current();
-  return doors == nullptr || doors->AdmitRead(path);
+  if (doors == nullptr) return true;
+  if (!doors->AdmitRead(path)) return false;
+  if (doors->Observer() != nullptr) doors->Observer()->AfterReadAdmitted(path);
+  return true;
 }
 
 }  // namespace vxfiles

@@ -18,6 +18,23 @@
 #include "foundation/export.h"
 #include "foundation/string/string_base.h"
 
+// Told of each change the doors admitted, before it is made, and of each installation read. The
+// run installs one (the undo journal and the run's report); the doors do not own it. A false from
+// a Before call refuses the change: the old state could not be kept, so the change must not happen.
+class VXM_EXPORT vxWriteObserver {
+ public:
+  enum class Change {
+    kEntry,    // an entry at path will be created, replaced by a rename, or removed
+    kInPlace,  // the file at path will be written where it stands (truncated or appended to)
+    kInto,     // entries will be made inside the folder path; missing folders will be created
+  };
+  virtual ~vxWriteObserver() = default;
+  virtual bool BeforeWrite(std::string_view path, Change change) = 0;
+  // The entry name of the folder open at dirFd will be created or replaced (copies of a tree).
+  virtual bool BeforeWriteAt(int dirFd, const char* name) = 0;
+  virtual void AfterReadAdmitted(std::string_view path) = 0;
+};
+
 class VXM_EXPORT vxRunDoors {
  public:
   // Receives every refusal as an "Error: " text and the path it concerns.
@@ -52,6 +69,10 @@ class VXM_EXPORT vxRunDoors {
   // report as missing. Other paths (the host's own files) are not installation reads.
   bool AdmitRead(std::string_view path);
 
+  // Installs the observer of this run's changes (null: none). Not owned.
+  void SetObserver(vxWriteObserver* observer) { observer_ = observer; }
+  vxWriteObserver* Observer() const { return observer_; }
+
   // folder joined with a name read from a settings file, as vxFileManager::MakePath joins them,
   // except that "." parts are dropped and ".." takes back the part before it. False, with an
   // "Error: " line through the current doors, when ".." would climb above folder.
@@ -83,12 +104,18 @@ class VXM_EXPORT vxRunDoors {
   bool destinationInsideSource_ = false;
   std::unordered_map<std::string, Within> located_;  // real folder -> first installation above it
   vxRunDoors* previous_ = nullptr;
+  vxWriteObserver* observer_ = nullptr;
 };
 
 // The checks of the current doors for the file layer; each admits everything outside a run.
 namespace vxfiles {
 VXM_EXPORT bool MayWrite(std::string_view path);
+// As MayWrite, for a file that will be written where it stands rather than replaced.
+VXM_EXPORT bool MayWriteInPlace(std::string_view path);
 VXM_EXPORT bool MayWriteInto(std::string_view folder);
+// The entry name of the folder open at dirFd (already admitted by MayWriteInto) is about to be
+// created or replaced; false when the run's observer could not keep what stands there.
+VXM_EXPORT bool MayWriteAt(int dirFd, const char* name);
 VXM_EXPORT bool MayRead(std::string_view path);
 }  // namespace vxfiles
 

@@ -277,7 +277,7 @@ void vxMappedINIFile::UpdateMapSection(const char* section, const INILineList* l
   }
 }
 
-void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other) {
+void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other, vxIniMergeObserver* observer) {
   if (&other == this) return;
   for (const auto& from : other.sections_) {
     // A section repeated in the other file, in any spelling, is hidden there too: sections meet
@@ -289,8 +289,16 @@ void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other) {
       if (line == nullptr) continue;
       auto first = from->index.find(line->LoadedKey());
       if (first == from->index.end() || first->second != line) continue;  // a repeated key
-      if (FindLine(*target, line->m_key.view()) != nullptr) continue;   // the destination wins
+      const INILine* kept = FindLine(*target, line->m_key.view());
+      if (kept != nullptr) {  // the destination wins
+        if (observer != nullptr && !(kept->m_value == line->m_value)) {
+          observer->KeyConflict(target->name, kept->m_key.view(), line->m_value.view(),
+                                kept->m_value.view());
+        }
+        continue;
+      }
       AppendLine(*target, CopyForThisFile(*line));
+      if (observer != nullptr) observer->KeyAdded(target->name, line->m_key.view(), line->m_value.view());
     }
   }
 }

@@ -21,6 +21,17 @@
 #include "foundation/inifile/ini_text.h"
 #include "foundation/string/string_base.h"
 
+// Told what a merge does to the file merged into, key by key. Values are as the files hold them.
+class VXM_EXPORT vxIniMergeObserver {
+ public:
+  virtual ~vxIniMergeObserver() = default;
+  // The key came from the other file.
+  virtual void KeyAdded(std::string_view section, std::string_view key, std::string_view value) = 0;
+  // Both files hold the key with different values; this file's value stays.
+  virtual void KeyConflict(std::string_view section, std::string_view key,
+                           std::string_view otherValue, std::string_view keptValue) = 0;
+};
+
 class VXM_EXPORT vxMappedINIFile {
  public:
   vxMappedINIFile();
@@ -90,7 +101,7 @@ class VXM_EXPORT vxMappedINIFile {
   // Adds every section and key of other that this file lacks; where both hold a key, this file's
   // value stays (the destination wins). New keys go after their section's last property line, new
   // sections at the end, both in other's order.
-  void MergeFrom(const vxMappedINIFile& other);
+  void MergeFrom(const vxMappedINIFile& other, vxIniMergeObserver* observer = nullptr);
 
   // Renames a section in place (its lines stay). 0 on success; 1 when from is absent or to exists.
   int RenameSection(const vxStringBase& from, const vxStringBase& to);

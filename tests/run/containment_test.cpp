@@ -217,8 +217,13 @@ TEST(Containment, ASecondRunOnTheSameDestinationIsRefusedWhileTheFirstCompletes)
   WriteFile(s.obx + "/go", "");
   EXPECT_EQ(0, Wait(first));
   Tree expected = TreeState(reference.obx), reached = TreeState(s.obx);
-  expected.erase("vxmigrate.log"), expected.erase("started");
-  reached.erase("vxmigrate.log"), reached.erase("started");
+  for (Tree* tree : {&expected, &reached}) {
+    for (const char* name : {"vxmigrate.log", "vxmigrate-report.json", "started"}) tree->erase(name);
+    // Each run's journal has its own times and inode numbers.
+    for (auto it = tree->begin(); it != tree->end();) {
+      it = it->first.compare(0, 10, ".vxmigrate") == 0 ? tree->erase(it) : std::next(it);
+    }
+  }
   EXPECT_EQ(expected, reached);
   EXPECT_EQ(LogEntries(reference.obx + "/vxmigrate.log").size(),
             LogEntries(s.obx + "/vxmigrate.log").size());

@@ -27,7 +27,6 @@ TEST(HostCommandLine, EachCaseHasItsStatusAndTextsAndRefusalsWriteNothing) {
       {{"-", "-h"}, 0, "Usage: vxmigrate -D1:", ""},
       {{"--help"}, 0, "  5  another run holds the destination\n", ""},
       {{"-", "--version"}, 0, "vxmigrate 0.1\n", ""},
-      {{"--dry-run"}, 2, "", std::string("vxmigrate: unknown option '--dry-run'\n") + kHint},
       {{"stray"}, 2, "", std::string("vxmigrate: unknown option 'stray'\n") + kHint},
       {{"-d1:/x"}, 2, "", std::string("vxmigrate: unknown option '-d1:/x'\n") + kHint},
       {{"-P2:obz"}, 2, "",
@@ -146,8 +145,10 @@ TEST(HostCommandLine, LogThatLosesEntriesIsAnError) {
   HostRun run({"p10_pavsuite"});
   EXPECT_EQ(4, run.Run(run.Options({"pavsuite", "pavsuite", "5.0", "5.5"}), -1, true));
   EXPECT_EQ("", ReadFile(run.log));
-  EXPECT_EQ("vxmigrate: the log " + run.log + " lost entries: File too large\n", run.Err());
-  EXPECT_TRUE(Has(run.Out(), "Errors:               1\nManual actions:       0\nLog:                  " +
+  // The undo journal cannot be kept either (a notice), and the report is not written (an error).
+  EXPECT_EQ("vxmigrate: the log " + run.log + " lost entries: File too large\nError: Unable to "
+            "write file:   " + run.dst + "/vxmigrate-report.json\n", run.Err());
+  EXPECT_TRUE(Has(run.Out(), "Errors:               1\nManual actions:       1\nLog:                  " +
                                  run.log + " (incomplete: File too large)\n"))
       << run.Out();
 }

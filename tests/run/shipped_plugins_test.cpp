@@ -32,9 +32,11 @@ std::string Source(const std::string& relative) {
 }
 
 // Every file below folder by relative name, with its content.
+// The run's own bookkeeping (its undo journal and report) is no installation file and is left out.
 Tree FilesBelow(const std::string& folder) {
   Tree files;
   for (const std::string& name : ListTree(folder)) {
+    if (name.rfind(".vxmigrate", 0) == 0 || name == "vxmigrate-report.json") continue;
     if (!fs::is_directory(folder + "/" + name)) files[name] = ReadFile(folder + "/" + name);
   }
   return files;
