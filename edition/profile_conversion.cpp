@@ -15,6 +15,7 @@
 #include "foundation/files/resolved_path.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/string/tokenizer.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
 #include "migrate/failed_copy.h"
 #include "migrate/manager.h"
@@ -246,7 +247,7 @@ void ConvertProfile(vxMigrationManager* manager, vxMappedINIFile& profile,
   ExpandAllProfilesKeys(manager, profile, target, ids);
 }
 
-// Copies one Halden profile to its marked name in the OBX profile folder and converts the copy.
+// Converts one Halden profile into its marked name in the OBX profile folder, written once.
 void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
                     const vxStringBase& destinationProfiles, AdvancedOptionIds& ids) {
   vxStringBase name(file.BaseName());
@@ -259,24 +260,28 @@ void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
     return;
   }
   const vxStringBase& source = file.Pathname();
-  if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
-                              nullptr) != 0) {
-    // The source is named only when it is the side that could not be read.
-    const vxFailedCopy blame = vxBlameFailedCopy(source, target);
-    manager->Log(blame.path == &target ? blame.text : "Error: Unable to open file:   ",
-                 blame.path->c_str());
-    return;
-  }
-  vxMappedINIFile profile(target);
-  if (profile.Open(1) != 0) {
-    // Left as copied: the user's own file, which the OBX edition may still read.
-    manager->Log("Error: Unable to open file:   ", target.c_str());
-    return;
-  }
-  ConvertProfile(manager, profile, target, ids);
-  if (profile.Close(1) != 0) {
-    manager->Log("Error: Unable to write file:   ", target.c_str());
-    return;
+  const vxConvertedCopy outcome = WriteConvertedCopy(source, target, [&](vxMappedINIFile& profile) {
+    ConvertProfile(manager, profile, target, ids);
+    return true;
+  });
+  switch (outcome) {
+    case vxConvertedCopy::kConverted:
+    case vxConvertedCopy::kDeclined:
+      break;
+    case vxConvertedCopy::kNotSettings:
+      // Carried as it is: the user's own file, which the OBX edition may still read.
+      manager->Log("Error: Unable to open file:   ", target.c_str());
+      return;
+    case vxConvertedCopy::kExists:
+      manager->Log("File exists - no copy made:  ", target.c_str());
+      return;
+    case vxConvertedCopy::kFailed: {
+      // The source is named only when it is the side that could not be read.
+      const vxFailedCopy blame = vxBlameFailedCopy(source, target);
+      manager->Log(blame.path == &target ? blame.text : "Error: Unable to open file:   ",
+                   blame.path->c_str());
+      return;
+    }
   }
   vxStringBase copied("Profile file copied: ");
   copied.append(source);

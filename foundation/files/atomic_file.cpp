@@ -10,6 +10,7 @@
 #include <unistd.h>
 
 #include "foundation/files/dir_entries.h"
+#include "foundation/files/file_manager.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/temp_file.h"
 #include "foundation/files/write_all.h"
@@ -58,7 +59,7 @@ void AtomicFileWriter::Abandon() {
   dirFd_ = -1;
 }
 
-bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
+bool AtomicFileWriter::Begin(const ReplaceTarget& target, bool makeFolder) {
   Abandon();
   target_ = target;
   failed_ = false;
@@ -67,6 +68,11 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target) {
   SplitPath(target.path, folder, name_);
   if (name_.empty()) return false;
   dirFd_ = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  // Made only when missing: a run writing thousands of files into one folder asks once.
+  if (dirFd_ < 0 && errno == ENOENT && makeFolder &&
+      vxFileManager::CreateDirectory(vxStringBase(folder.c_str()), nullptr) == 0) {
+    dirFd_ = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  }
   if (dirFd_ < 0) return false;
   // 0600 until complete: nobody else reads a file that is still being written.
   fd_ = CreateTempFileAt(dirFd_, name_.c_str(), 0600, tempName_);

@@ -40,9 +40,10 @@ class AtomicFileWriter {
   AtomicFileWriter(const AtomicFileWriter&) = delete;
   AtomicFileWriter& operator=(const AtomicFileWriter&) = delete;
 
-  // Creates the temporary file in the target's folder. False on failure (the door refused, the
-  // folder is missing or not writable).
-  bool Begin(const ReplaceTarget& target);
+  // Creates the temporary file in the target's folder; with makeFolder, a missing folder (and its
+  // missing parents) is made first. False on failure (the door refused, the folder is missing or
+  // not writable).
+  bool Begin(const ReplaceTarget& target, bool makeFolder = false);
   // Writes data to the temporary file (callers buffer); false once any write has failed.
   bool Append(std::string_view data);
   // Gives the file the target's mode (and owner, where allowed), with flushToDisk syncs it, and

@@ -63,8 +63,8 @@ class VXM_EXPORT vxMappedINIFile {
 
   // Writes the sections to path as a new file, atomically, and never replaces an entry already
   // there (nor one that appears meanwhile). The file takes the mode of the file the content was
-  // read from, else 0666 less the umask. The object stays bound to its own name. 0 written; 1
-  // failed; 2 path exists and was left as it is.
+  // read from, else 0666 less the umask; missing folders are made. The object stays bound to its
+  // own name. 0 written; 1 failed; 2 path exists and was left as it is.
   int CreateAs(const vxStringBase& path);
 
   // Makes this object a copy of other's content (sections, lines, layout) in memory, as if read

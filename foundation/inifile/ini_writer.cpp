@@ -142,7 +142,7 @@ int vxMappedINIFile::CreateAs(const vxStringBase& path) {
     target.mode = loadedMode_ != 0 ? loadedMode_ : vxfiles::NewFileMode();
     vxfiles::AtomicFileWriter out;
     INIFileWriter writer(*this, [&out](std::string_view chunk) { return out.Append(chunk); });
-    if (!out.Begin(target) || !writer.Render()) return 1;
+    if (!out.Begin(target, true) || !writer.Render()) return 1;
     if (out.Commit(false, false)) return 0;
     return errno == EEXIST ? 2 : 1;
   } catch (...) {

@@ -200,8 +200,11 @@ TEST(IniFile, CreateAsWritesOnceAndCopiesInMemoryStayApart) {
   WriteFile(dir.Path("taken.ini"), "theirs\n");
   EXPECT_EQ(2, copy.CreateAs(dir.Path("taken.ini").c_str()));
   EXPECT_EQ("theirs\n", ReadFile(dir.Path("taken.ini")));
-  EXPECT_EQ(1, copy.CreateAs(dir.Path("no/such/folder.ini").c_str()));
-  EXPECT_EQ((Names{"converted.ini", "standard.ini", "taken.ini"}), vxtest::ListTree(dir.path()));
+  EXPECT_EQ(0, copy.CreateAs(dir.Path("new/folder/made.ini").c_str()));
+  EXPECT_EQ(1, copy.CreateAs(dir.Path("taken.ini/below.ini").c_str()));  // a file on the way
+  EXPECT_EQ((Names{"converted.ini", "new", "new/folder", "new/folder/made.ini", "standard.ini",
+                   "taken.ini"}),
+            vxtest::ListTree(dir.path()));
 
   struct stat before;
   ASSERT_EQ(0, stat(dir.Path("standard.ini").c_str(), &before));
