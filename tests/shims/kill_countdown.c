@@ -104,30 +104,28 @@ FORWARD(int, creat64, (const char* path, mode_t mode), (path, mode), 1)
 static int TakesMode(int flags) {
   return (flags & O_CREAT) != 0 || (flags & O_TMPFILE) == O_TMPFILE;
 }
-#define FORWARD_OPEN(name)                                                     \
-  int name(const char* path, int flags, ...) {                                 \
-    static void* real;                                                         \
-    mode_t mode = 0;                                                           \
-    if (TakesMode(flags)) {                                                    \
-      va_list rest;                                                            \
-      va_start(rest, flags);                                                   \
-      mode = (mode_t)va_arg(rest, int);                                        \
-      va_end(rest);                                                            \
-    }                                                                          \
-    if (ChangesFile(flags)) CountChange();                                     \
+// Declares mode from the variadic argument after flags where there is one, and counts the open
+// when it may change a file.
+#define TAKE_MODE_AND_COUNT(flags, mode)   \
+  mode_t mode = 0;                         \
+  if (TakesMode(flags)) {                  \
+    va_list rest;                          \
+    va_start(rest, flags);                 \
+    mode = (mode_t)va_arg(rest, int);      \
+    va_end(rest);                          \
+  }                                        \
+  if (ChangesFile(flags)) CountChange()
+
+#define FORWARD_OPEN(name)                                                          \
+  int name(const char* path, int flags, ...) {                                      \
+    static void* real;                                                              \
+    TAKE_MODE_AND_COUNT(flags, mode);                                               \
     return ((int (*)(const char*, int, ...))Next(&real, #name))(path, flags, mode); \
   }
-#define FORWARD_OPENAT(name)                                                              \
-  int name(int dir, const char* path, int flags, ...) {                                   \
-    static void* real;                                                                    \
-    mode_t mode = 0;                                                                      \
-    if (TakesMode(flags)) {                                                               \
-      va_list rest;                                                                       \
-      va_start(rest, flags);                                                              \
-      mode = (mode_t)va_arg(rest, int);                                                   \
-      va_end(rest);                                                                       \
-    }                                                                                     \
-    if (ChangesFile(flags)) CountChange();                                                \
+#define FORWARD_OPENAT(name)                                                                  \
+  int name(int dir, const char* path, int flags, ...) {                                       \
+    static void* real;                                                                        \
+    TAKE_MODE_AND_COUNT(flags, mode);                                                         \
     return ((int (*)(int, const char*, int, ...))Next(&real, #name))(dir, path, flags, mode); \
   }
 FORWARD_OPEN(open)
