@@ -65,7 +65,7 @@ FORWARD(ssize_t, pwrite64, (int fd, const void* data, size_t size, off64_t at),
         (fd, data, size, at), fd > 2)
 FORWARD(ssize_t, writev, (int fd, const struct iovec* parts, int count), (fd, parts, count), fd > 2)
 FORWARD(ssize_t, copy_file_range,
-        (int in, off_t* inAt, int out, off_t* outAt, size_t size, unsigned int flags),
+        (int in, off64_t* inAt, int out, off64_t* outAt, size_t size, unsigned int flags),
         (in, inAt, out, outAt, size, flags), 1)
 FORWARD(ssize_t, sendfile, (int out, int in, off_t* at, size_t size), (out, in, at, size), 1)
 FORWARD(ssize_t, sendfile64, (int out, int in, off64_t* at, size_t size), (out, in, at, size), 1)
