@@ -1,8 +1,9 @@
 // Protected values: the text form of stored passwords and user names, "D9" + upper-case hexadecimal
 // of the complemented Twofish (ECB) encryption of the value + "AB". The reader also takes the
-// previous generation's 80-digit form and plain text. All functions are reentrant and safe on any
-// input: a bad value gives the failure result, never a read or write past a buffer the caller sized
-// as documented.
+// previous generation's 80-digit form and plain text. All functions are safe on any input: a bad
+// value gives the failure result, never a read or write past a buffer the caller sized as
+// documented. The Twofish key schedule of the last key used is kept per thread, so calls from
+// several threads need no locking and only the first call with a key pays for its schedule.
 
 #ifndef VXMIGRATE_CRYPT_PROTECTED_VALUE_H_
 #define VXMIGRATE_CRYPT_PROTECTED_VALUE_H_

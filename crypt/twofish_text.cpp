@@ -1,7 +1,8 @@
 // TwoFishEncrypt and TwoFishDecrypt: a value, preceded by its length as four little-endian bytes,
 // encrypted in whole Twofish blocks (ECB), each ciphertext byte complemented and written as two
 // upper-case digits. The reader trusts nothing in its input: every count is checked against the
-// bytes actually decrypted before anything is copied.
+// bytes actually decrypted before anything is copied. The key's instances come from the per-thread
+// cache: building the schedule is what a call would otherwise spend nearly all its time on.
 
 #include "crypt/twofish_text.h"
 
@@ -11,6 +12,7 @@
 #include <cstring>
 
 #include "crypt/hex_digits.h"
+#include "crypt/key_schedule_cache.h"
 #include "crypt/protected_value.h"
 #include "crypt/twofish_instances.h"
 
@@ -76,11 +78,13 @@ int DecryptHexDigits(const char* keyText, const char* hex, std::size_t hexLength
     buffer.get()[i] = static_cast<std::uint8_t>(~byte);
   }
 
-  TwofishKeyInstance key;
-  TwofishCipherInstance cipher;
-  if (!PrepareTwofishInstances(&key, &cipher, kDirectionDecrypt, keyText, keyBits)) return 0;
+  const TwofishKeyPair* instances = CachedTwofishInstances(keyText, keyBits);
+  if (instances == nullptr) return 0;
   long long bits = static_cast<long long>(count) * 8;
-  if (BlockDecrypt(&cipher, &key, buffer.get(), bits, buffer.get()) != bits) return 0;
+  if (BlockDecrypt(&instances->cipher, &instances->decrypt, buffer.get(), bits, buffer.get()) !=
+      bits) {
+    return 0;
+  }
 
   // A length field claiming more bytes than were decrypted means a wrong key or a damaged text.
   std::uint32_t stored = ReadLittleEndian32(buffer.get());
@@ -108,11 +112,13 @@ int TwoFishEncrypt(char* keyText, unsigned char* data, unsigned long length, cha
   }
   std::memcpy(buffer.get() + kLengthFieldBytes, data, length);
 
-  TwofishKeyInstance key;
-  TwofishCipherInstance cipher;
-  if (!PrepareTwofishInstances(&key, &cipher, kDirectionEncrypt, keyText, keyBits)) return 0;
+  const TwofishKeyPair* instances = CachedTwofishInstances(keyText, keyBits);
+  if (instances == nullptr) return 0;
   long long bits = static_cast<long long>(length) * 8 + 32;
-  if (BlockEncrypt(&cipher, &key, buffer.get(), bits, buffer.get()) != bits) return 0;
+  if (BlockEncrypt(&instances->cipher, &instances->encrypt, buffer.get(), bits, buffer.get()) !=
+      bits) {
+    return 0;
+  }
 
   for (std::size_t i = 0; i < bytes; ++i) {
     WriteHexByte(static_cast<unsigned char>(~buffer.get()[i]), output + 2 * i);

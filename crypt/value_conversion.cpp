@@ -48,3 +48,18 @@ int DecryptToClearText(vxStringBase& value) {
   value = reinterpret_cast<const char*>(clear);
   return 0;
 }
+
+int ConvertToClearText(vxStringBase& value) {
+  char text[kWorkingBufferChars];
+  if (!CopyToWorkingBuffer(value, text)) return 1;
+  if (VXUI_IsOurTwoFish(text)) return DecryptToClearText(value);
+  Obsolete_EncodePasswordOrUserName(text);
+  // Where the protected form would not fit, the two-step conversion keeps the stored value and
+  // only reads it: the result must not depend on which way a caller goes.
+  if (ProtectedChars(static_cast<unsigned long>(std::strlen(text))) > kWorkingBufferChars) {
+    DecryptToClearText(value);
+    return 1;
+  }
+  value = text;
+  return 0;
+}

@@ -1,6 +1,7 @@
 // Feeds arbitrary bytes to every reader and writer of stored passwords and user names. Output
 // buffers are sized exactly as each function documents, so the address sanitizer reports any write
-// past them; a value that does not read back as it was written stops the run.
+// past them; a value that does not read back as it was written, or a one-step conversion to clear
+// text that ends elsewhere than protecting and reading, stops the run.
 // Input: byte 0 is the capacity handed to the readers, byte 1 the key text's length, then the key
 // text, then the stored text or value.
 
@@ -37,11 +38,14 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     std::abort();
   }
 
-  vxStringBase value(text.c_str()), raw(text.c_str());
-  if (ConvertToProtectedValue(value) == 0 && !VXUI_IsOurTwoFish(const_cast<char*>(value.c_str()))) {
+  vxStringBase value(text.c_str()), raw(text.c_str()), direct(text.c_str());
+  const int protectedResult = ConvertToProtectedValue(value);
+  if (protectedResult == 0 && !VXUI_IsOurTwoFish(const_cast<char*>(value.c_str()))) {
     std::abort();
   }
   DecryptToClearText(value);
   DecryptToClearText(raw);
+  // The one-step conversion to clear text must end where protecting and reading ends.
+  if (ConvertToClearText(direct) != protectedResult || direct != value) std::abort();
   return 0;
 }

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <vector>
 
 #include "crypt/legacy_pad.h"
 #include "crypt/protected_value.h"
@@ -68,6 +69,35 @@ TEST(DecryptToClearText, ReadsEveryFormAndKeepsWhatItCannotRead) {
     EXPECT_EQ(stored.size() < 1024 ? 0 : 1, DecryptToClearText(value));
     EXPECT_EQ(clear, value.str());
   }
+}
+
+// The one-step conversion to clear text must end exactly where protecting and then reading does,
+// with the same result, for every form a stored value may be in.
+TEST(ConvertToClearText, EndsWhereProtectingAndReadingEnds) {
+  std::vector<std::string> stored = {
+      "", "D9265FD237230134CD2AFFDC06B162A27CAB", "D9365FD237230134CD2AFFDC06B162A27CAB",
+      "000000610362" + std::string(68, '0'),  // 80 digits: read as legacy here, not as old form
+      std::string("\0hidden", 7), std::string(1023, 'p'), std::string(1024, 'p')};
+  for (std::size_t n : {1, 8, 70, 491, 492, 493, 600, 1023}) {
+    stored.push_back(Legacy(std::string(n, 'w')));
+  }
+  unsigned seed = 12345;
+  for (int i = 0; i < 200; ++i) {  // printable texts as a user might have typed them
+    std::string text(1 + i % 40, ' ');
+    for (char& c : text) c = static_cast<char>(32 + (seed = seed * 1103515245 + 12345) % 95);
+    stored.push_back(Legacy(text));
+  }
+  for (const std::string& s : stored) {
+    vxStringBase twoSteps(s.c_str(), s.size());
+    vxStringBase oneStep(twoSteps);
+    const int expected = ConvertToProtectedValue(twoSteps);
+    DecryptToClearText(twoSteps);
+    EXPECT_EQ(expected, ConvertToClearText(oneStep)) << s;
+    EXPECT_EQ(twoSteps.str(), oneStep.str()) << s;
+  }
+  vxStringBase password(Legacy("password").c_str());
+  EXPECT_EQ(0, ConvertToClearText(password));
+  EXPECT_EQ("password", password.str());
 }
 
 }  // namespace
