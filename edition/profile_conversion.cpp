@@ -8,6 +8,7 @@
 #include <cstdint>
 #include <string>
 
+#include "crypt/value_conversion.h"
 #include "edition/edition_util.h"
 #include "edition/halden_to_obx.h"
 #include "foundation/files/file_info.h"
@@ -104,11 +105,18 @@ void UnwrapFilterSections(vxMappedINIFile& profile) {
 }
 
 // A stored credential put into the form the OBX edition reads: protected, or in clear when clear
-// is set (converted first, so that any old form is read). An empty value stays empty.
+// is set (any old form is read; a legacy value goes straight to clear text, never through the
+// cipher). An empty value stays empty.
 void ConvertCredential(vxMigrationManager* manager, vxStringBase& value, bool clear) {
   if (value.isEmpty()) return;
-  manager->DoConvertEncryptedValue(value);
-  if (clear) manager->DoDecryptValue(value);
+  if (!clear) {
+    manager->DoConvertEncryptedValue(value);
+  } else if (ConvertToClearText(value) != 0) {
+    // As the protecting step says of a value too long for its buffers.
+    const std::string length = std::to_string(value.length());
+    manager->Log("Error: Value too long to protect - left unchanged, characters: ",
+                 length.c_str());
+  }
 }
 
 // The same for a key of section "Profile", changed in place.
