@@ -6,7 +6,9 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/manager.h"
 
@@ -48,7 +50,14 @@ EventOutcome RedirectEvent(const vxStringBase& eventPath, const vxStringBase& pr
 
 int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pattern,
                                              const char* extension, const char* exclusions) {
-  if (IsInPlaceMigrate()) return 0;
+  CopyMarkedFiles(folder, pattern, extension, exclusions, nullptr, nullptr);
+  return 0;
+}
+
+void vxMigrationManager::CopyMarkedFiles(
+    const char* folder, const char* pattern, const char* extension, const char* exclusions,
+    const MarkedCopyConversion* convert, std::vector<vxStringBase>* made) {
+  if (IsInPlaceMigrate()) return;
   const vxStringBase relative(folder);
   vxStringBase sourceFolder;
   vxFileManager::MakePath(sourceFolder, m_sourceDirectory, relative, 0);
@@ -68,11 +77,36 @@ int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pat
       Log("File exists - no copy made: ", destination.c_str());
       continue;
     }
-    // Logged as copied whatever the copy answered: the later steps look at what is there.
-    vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
-    Log("File copied:  ", destination.c_str());
+    if (convert == nullptr) {
+      // Logged as copied whatever the copy answered: the later steps look at what is there.
+      vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
+      Log("File copied:  ", destination.c_str());
+      if (made != nullptr) made->push_back(destination);
+      continue;
+    }
+    std::string declined;
+    const vxConvertedCopy outcome = WriteConvertedCopy(
+        source, destination, [&](vxMappedINIFile& content) { return (*convert)(content, declined); });
+    switch (outcome) {
+      case vxConvertedCopy::kExists:
+        Log("File exists - no copy made: ", destination.c_str());
+        break;
+      case vxConvertedCopy::kFailed:
+        vxLogFailedCopy(*this, source, destination);
+        break;
+      case vxConvertedCopy::kNotSettings:
+        Log("File copied:  ", destination.c_str());
+        Log("Error: Profile is not a valid settings file - left as copied: ", destination.c_str());
+        if (made != nullptr) made->push_back(destination);
+        break;
+      case vxConvertedCopy::kConverted:
+      case vxConvertedCopy::kDeclined:
+        Log("File copied:  ", destination.c_str());
+        if (!declined.empty()) Log(declined.c_str(), destination.c_str());
+        if (made != nullptr) made->push_back(destination);
+        break;
+    }
   }
-  return 0;
 }
 
 int vxMigrationManager::CopyScheduledEventFiles(const char* folder, const char* pattern,
