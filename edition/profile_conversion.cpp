@@ -5,8 +5,10 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 #include "crypt/value_conversion.h"
 #include "edition/edition_util.h"
@@ -87,12 +89,21 @@ class AdvancedOptionIds {
   vxStringBase ids_[kAllProfilesKeyCount];
 };
 
-// "file:///var/log/a.log" -> "/var/log/a.log": the OBX edition reads plain paths. The scheme and
-// the URL's first eight characters go; when they end in the path's own leading slash ("file:///")
-// that slash stays, so that the path remains absolute.
+// True when text starts with a drive letter and ':' ("C:/logs", "d:\\logs").
+bool StartsWithDrive(std::string_view text) {
+  return text.size() >= 2 && text[1] == ':' &&
+         ((text[0] >= 'A' && text[0] <= 'Z') || (text[0] >= 'a' && text[0] <= 'z'));
+}
+
+// The OBX edition reads plain paths: the scheme and the URL's first eight characters go.
+// "file:///C:/logs/a.log" -> "C:/logs/a.log" (a drive path), but "file:///var/log/a.log" ->
+// "/var/log/a.log": there the eighth character is the path's own leading slash, which stays so
+// that the path remains absolute.
 void StripFileScheme(vxStringBase& path) {
   if (path.length() <= 8 || !path.beginsWith("file:")) return;
-  path = path.subString(path.beginsWith("file:///") ? 7 : 8, vxStringBase::BadIndex);
+  const bool keepSlash =
+      path.beginsWith("file:///") && !StartsWithDrive(path.view().substr(8));
+  path = path.subString(keepSlash ? 7 : 8, vxStringBase::BadIndex);
 }
 
 // Sections written "[[Filter1]]" in the Halden edition are "[Filter1]" in the OBX edition.
@@ -211,7 +222,16 @@ void ConvertWarehouse(vxMigrationManager* manager, vxMappedINIFile& profile) {
   const vxStringBase path = profile.GetVal("Profile", "LogFilePath");
   if (!path.beginsWith("warehouse:")) return;
   const vxStringBase dataSource = path.subString(path.find(':') + 1, vxStringBase::BadIndex);
-  const vxStringBase user = profile.GetVal("Profile", "LogFileUsername");
+  vxStringBase user = profile.GetVal("Profile", "LogFileUsername");
+  // The server's "LogFileUserName" and the warehouse's "LogFileUsername" are two keys. Where both
+  // stand, the server conversion took its own, and the warehouse user is read into clear here, as
+  // the server conversion reads it where the profile holds the warehouse key alone.
+  const INILineList* lines = profile.GetPropertyList(vxStringBase("Profile"));
+  const bool bothKeys =
+      lines != nullptr && std::any_of(lines->begin(), lines->end(), [](const INILine* line) {
+        return line != nullptr && line->m_key.equals("LogFileUserName", true);
+      });
+  if (bothKeys) ConvertCredential(manager, user, true);
   const vxStringBase password = profile.GetVal("Profile", "LogFilePassword");
   profile.SetVal("wdwexport", "warehousedsn", dataSource);
   profile.SetVal("wdwexport", "warehouseusername", user);
