@@ -87,6 +87,7 @@ class VXM_EXPORT HaldenToOBXHelper {
   INILineList* destinationSection_ = nullptr;  // the destination object being set
   vxMappedINIFile sourceTemplate_;
   vxMappedINIFile destinationTemplate_;
+  vxMappedINIFile standardTemplate_;  // the destination's standard template, read once per run
 };
 
 #endif  // VXMIGRATE_EDITION_HALDEN_TO_OBX_H_

@@ -5,9 +5,12 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <string>
+#include <string_view>
 
+#include "crypt/value_conversion.h"
 #include "edition/edition_util.h"
 #include "edition/halden_to_obx.h"
 #include "foundation/files/file_info.h"
@@ -15,6 +18,7 @@
 #include "foundation/files/resolved_path.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/string/tokenizer.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
 #include "migrate/failed_copy.h"
 #include "migrate/manager.h"
@@ -85,12 +89,21 @@ class AdvancedOptionIds {
   vxStringBase ids_[kAllProfilesKeyCount];
 };
 
-// "file:///var/log/a.log" -> "/var/log/a.log": the OBX edition reads plain paths. The scheme and
-// the URL's first eight characters go; when they end in the path's own leading slash ("file:///")
-// that slash stays, so that the path remains absolute.
+// True when text starts with a drive letter and ':' ("C:/logs", "d:\\logs").
+bool StartsWithDrive(std::string_view text) {
+  return text.size() >= 2 && text[1] == ':' &&
+         ((text[0] >= 'A' && text[0] <= 'Z') || (text[0] >= 'a' && text[0] <= 'z'));
+}
+
+// The OBX edition reads plain paths: the scheme and the URL's first eight characters go.
+// "file:///C:/logs/a.log" -> "C:/logs/a.log" (a drive path), but "file:///var/log/a.log" ->
+// "/var/log/a.log": there the eighth character is the path's own leading slash, which stays so
+// that the path remains absolute.
 void StripFileScheme(vxStringBase& path) {
   if (path.length() <= 8 || !path.beginsWith("file:")) return;
-  path = path.subString(path.beginsWith("file:///") ? 7 : 8, vxStringBase::BadIndex);
+  const bool keepSlash =
+      path.beginsWith("file:///") && !StartsWithDrive(path.view().substr(8));
+  path = path.subString(keepSlash ? 7 : 8, vxStringBase::BadIndex);
 }
 
 // Sections written "[[Filter1]]" in the Halden edition are "[Filter1]" in the OBX edition.
@@ -103,11 +116,18 @@ void UnwrapFilterSections(vxMappedINIFile& profile) {
 }
 
 // A stored credential put into the form the OBX edition reads: protected, or in clear when clear
-// is set (converted first, so that any old form is read). An empty value stays empty.
+// is set (any old form is read; a legacy value goes straight to clear text, never through the
+// cipher). An empty value stays empty.
 void ConvertCredential(vxMigrationManager* manager, vxStringBase& value, bool clear) {
   if (value.isEmpty()) return;
-  manager->DoConvertEncryptedValue(value);
-  if (clear) manager->DoDecryptValue(value);
+  if (!clear) {
+    manager->DoConvertEncryptedValue(value);
+  } else if (ConvertToClearText(value) != 0) {
+    // As the protecting step says of a value too long for its buffers.
+    const std::string length = std::to_string(value.length());
+    manager->Log("Error: Value too long to protect - left unchanged, characters: ",
+                 length.c_str());
+  }
 }
 
 // The same for a key of section "Profile", changed in place.
@@ -202,7 +222,16 @@ void ConvertWarehouse(vxMigrationManager* manager, vxMappedINIFile& profile) {
   const vxStringBase path = profile.GetVal("Profile", "LogFilePath");
   if (!path.beginsWith("warehouse:")) return;
   const vxStringBase dataSource = path.subString(path.find(':') + 1, vxStringBase::BadIndex);
-  const vxStringBase user = profile.GetVal("Profile", "LogFileUsername");
+  vxStringBase user = profile.GetVal("Profile", "LogFileUsername");
+  // The server's "LogFileUserName" and the warehouse's "LogFileUsername" are two keys. Where both
+  // stand, the server conversion took its own, and the warehouse user is read into clear here, as
+  // the server conversion reads it where the profile holds the warehouse key alone.
+  const INILineList* lines = profile.GetPropertyList(vxStringBase("Profile"));
+  const bool bothKeys =
+      lines != nullptr && std::any_of(lines->begin(), lines->end(), [](const INILine* line) {
+        return line != nullptr && line->m_key.equals("LogFileUserName", true);
+      });
+  if (bothKeys) ConvertCredential(manager, user, true);
   const vxStringBase password = profile.GetVal("Profile", "LogFilePassword");
   profile.SetVal("wdwexport", "warehousedsn", dataSource);
   profile.SetVal("wdwexport", "warehouseusername", user);
@@ -246,7 +275,7 @@ void ConvertProfile(vxMigrationManager* manager, vxMappedINIFile& profile,
   ExpandAllProfilesKeys(manager, profile, target, ids);
 }
 
-// Copies one Halden profile to its marked name in the OBX profile folder and converts the copy.
+// Converts one Halden profile into its marked name in the OBX profile folder, written once.
 void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
                     const vxStringBase& destinationProfiles, AdvancedOptionIds& ids) {
   vxStringBase name(file.BaseName());
@@ -259,24 +288,28 @@ void MigrateProfile(vxMigrationManager* manager, const vxFilename& file,
     return;
   }
   const vxStringBase& source = file.Pathname();
-  if (vxFileManager::CopyFile(ResolvedCopySource(source), target, 0, 1, 0, 0, 0, nullptr,
-                              nullptr) != 0) {
-    // The source is named only when it is the side that could not be read.
-    const vxFailedCopy blame = vxBlameFailedCopy(source, target);
-    manager->Log(blame.path == &target ? blame.text : "Error: Unable to open file:   ",
-                 blame.path->c_str());
-    return;
-  }
-  vxMappedINIFile profile(target);
-  if (profile.Open(1) != 0) {
-    // Left as copied: the user's own file, which the OBX edition may still read.
-    manager->Log("Error: Unable to open file:   ", target.c_str());
-    return;
-  }
-  ConvertProfile(manager, profile, target, ids);
-  if (profile.Close(1) != 0) {
-    manager->Log("Error: Unable to write file:   ", target.c_str());
-    return;
+  const vxConvertedCopy outcome = WriteConvertedCopy(source, target, [&](vxMappedINIFile& profile) {
+    ConvertProfile(manager, profile, target, ids);
+    return true;
+  });
+  switch (outcome) {
+    case vxConvertedCopy::kConverted:
+    case vxConvertedCopy::kDeclined:
+      break;
+    case vxConvertedCopy::kNotSettings:
+      // Carried as it is: the user's own file, which the OBX edition may still read.
+      manager->Log("Error: Unable to open file:   ", target.c_str());
+      return;
+    case vxConvertedCopy::kExists:
+      manager->Log("File exists - no copy made:  ", target.c_str());
+      return;
+    case vxConvertedCopy::kFailed: {
+      // The source is named only when it is the side that could not be read.
+      const vxFailedCopy blame = vxBlameFailedCopy(source, target);
+      manager->Log(blame.path == &target ? blame.text : "Error: Unable to open file:   ",
+                   blame.path->c_str());
+      return;
+    }
   }
   vxStringBase copied("Profile file copied: ");
   copied.append(source);

@@ -17,7 +17,6 @@
 #include "edition/standard_templates.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
-#include "foundation/files/resolved_path.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -137,16 +136,18 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
   conversion.append(" to ");
   conversion.append(targetPath);
 
-  vxStringBase standardPath;
-  vxFileManager::MakePath(standardPath, destinationFolder_, kServerFolder, kStandardTemplate);
-  vxFileManager::CopyFile(ResolvedCopySource(standardPath), targetPath, 0, 1, 0, 0, 0, nullptr,
-                          nullptr);
-  destinationTemplate_.SetFilename(targetPath);
-  if (destinationTemplate_.Open(1) != 0) {
-    sourceTemplate_.Close(0);
-    manager_->Log("Error: MSS to WCT conversion failed: ", conversion.c_str());
-    return 0;
+  // The standard template is read once per run; each conversion starts from a copy in memory.
+  if (!standardTemplate_.IsLoaded()) {
+    vxStringBase standardPath;
+    vxFileManager::MakePath(standardPath, destinationFolder_, kServerFolder, kStandardTemplate);
+    standardTemplate_.SetFilename(standardPath);
+    if (standardTemplate_.Open(1) != 0) {
+      sourceTemplate_.Close(0);
+      manager_->Log("Error: MSS to WCT conversion failed: ", conversion.c_str());
+      return 0;
+    }
   }
+  destinationTemplate_.CopyFrom(standardTemplate_);
 
   // Everything off first: only what the old template asked for is switched back on.
   const int64_t objects =
@@ -181,7 +182,10 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
   destinationSection_ = nullptr;
 
   sourceTemplate_.Close(0);
-  if (destinationTemplate_.Close(1) != 0) {
+  // Written once, complete, and never over a template that appeared since the check.
+  const int written = destinationTemplate_.CreateAs(targetPath);
+  destinationTemplate_.Close(0);
+  if (written != 0) {
     manager_->Log("Error: MSS to WCT conversion failed: ", conversion.c_str());
     return 0;
   }

@@ -9,6 +9,7 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
@@ -48,17 +49,10 @@ void RedirectRecipientList(vxMappedINIFile& profile, const char* section) {
   }
 }
 
-void RewriteAlertProfile(vxMigrationManager& manager, const vxStringBase& path) {
-  vxMappedINIFile profile(path);
-  if (profile.Open(1) != 0) {
-    manager.Log("Error: Profile is not a valid settings file - left as copied: ", path.c_str());
-    return;
-  }
+bool RedirectRecipientLists(vxMappedINIFile& profile) {
   RedirectRecipientList(profile, "Alert_Pager_List");
   RedirectRecipientList(profile, "Alert_Email_List");
-  if (profile.Close(1) != 0) {
-    manager.Log("Error: Profile could not be written - left as copied: ", path.c_str());
-  }
+  return true;
 }
 
 }  // namespace
@@ -91,12 +85,20 @@ int vxMigrationManager::DoCopyAlertProfiles(const char* folder, const char* patt
       Log("File exists - no copy made:  ", target.c_str());
       continue;
     }
-    if (vxFileManager::CopyFile(source, target, 0, 1, 0, 0, 0, nullptr, nullptr) != 0) {
+    // Pointed at the marked lists on its way, and written once.
+    const vxConvertedCopy outcome = WriteConvertedCopy(source, target, RedirectRecipientLists);
+    if (outcome == vxConvertedCopy::kExists) {
+      Log("File exists - no copy made:  ", target.c_str());
+      continue;
+    }
+    if (outcome == vxConvertedCopy::kFailed) {
       Log("Error: File could not be copied: ", source.c_str());
       continue;
     }
     Log("File copied:  ", target.c_str());
-    RewriteAlertProfile(*this, target);
+    if (outcome == vxConvertedCopy::kNotSettings) {
+      Log("Error: Profile is not a valid settings file - left as copied: ", target.c_str());
+    }
   }
 
   if (BothKeepCategories(*this, false)) {

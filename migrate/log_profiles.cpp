@@ -6,6 +6,7 @@
 
 #include <cstring>
 #include <string>
+#include <unordered_set>
 #include <vector>
 
 #include "crypt/protected_value.h"
@@ -89,6 +90,19 @@ const char* ProtectCredentials(vxMigrationManager& manager, vxMappedINIFile& pro
   return nullptr;
 }
 
+// The conversion of a log profile: home page split, credentials protected. False, with the reason
+// in declined, when a credential cannot be protected: the profile is then kept as it was.
+bool ConvertLogProfile(vxMigrationManager& manager, vxMappedINIFile& profile,
+                       std::string& declined) {
+  SplitHomePage(profile);
+  if (const char* key = ProtectCredentials(manager, profile)) {
+    declined = "Error: Value of ";
+    declined.append(key).append(" cannot be protected - profile left as copied: ");
+    return false;
+  }
+  return true;
+}
+
 // Rewrites one destination profile's settings; anything it cannot do leaves the file as it is.
 void RewriteProfileSettings(vxMigrationManager& manager, const vxStringBase& path, bool flush) {
   vxMappedINIFile profile(path);
@@ -96,11 +110,9 @@ void RewriteProfileSettings(vxMigrationManager& manager, const vxStringBase& pat
     manager.Log("Error: Profile is not a valid settings file - left as copied: ", path.c_str());
     return;
   }
-  SplitHomePage(profile);
-  if (const char* key = ProtectCredentials(manager, profile)) {
-    std::string text = "Error: Value of ";
-    text.append(key).append(" cannot be protected - profile left as copied: ");
-    manager.Log(text.c_str(), path.c_str());
+  std::string declined;
+  if (!ConvertLogProfile(manager, profile, declined)) {
+    manager.Log(declined.c_str(), path.c_str());
     profile.Close(0);
     return;
   }
@@ -111,8 +123,11 @@ void RewriteProfileSettings(vxMigrationManager& manager, const vxStringBase& pat
 }
 
 // Every profile of the destination folder that matches pattern, the new installation's own
-// included: the caller's pattern decides which ones.
-void RewriteProfiles(vxMigrationManager& manager, const vxStringBase& folder, const char* pattern) {
+// included (the caller's pattern decides which ones), but the copies this run converted already.
+void RewriteProfiles(vxMigrationManager& manager, const vxStringBase& folder, const char* pattern,
+                     const std::vector<vxStringBase>& converted) {
+  std::unordered_set<std::string> skip;
+  for (const vxStringBase& path : converted) skip.insert(path.str());
   vxStringBase destinationFolder;
   vxFileManager::MakePath(destinationFolder, manager.GetDestinationDirectory(), folder, 0);
   const bool flush = manager.GetDestinationProductID() == kFirewallProduct;
@@ -121,6 +136,7 @@ void RewriteProfiles(vxMigrationManager& manager, const vxStringBase& folder, co
   for (const vxFileInfo& file : files) {
     vxStringBase path;
     vxFileManager::MakePath(path, destinationFolder, file.GetFilename().Filename(), 1);
+    if (skip.count(path.str()) != 0) continue;
     RewriteProfileSettings(manager, path, flush);
   }
 }
@@ -137,9 +153,15 @@ int vxMigrationManager::DoCopyLogProfiles(const char* folder, const char* patter
   if (option != nullptr) selection = m_cmdLineParser->GetValue(option);
   const vxStringBase exclusions = MakeProfileExclusions(*this, selection, folder, extension, fixedList);
 
-  CopyRenamedUserFiles(folder, pattern, extension, exclusions.c_str());
+  // Each marked copy is converted on its way, written once; the destination's other profiles
+  // that match are rewritten where they stand.
+  const MarkedCopyConversion convert = [this](vxMappedINIFile& profile, std::string& declined) {
+    return ConvertLogProfile(*this, profile, declined);
+  };
+  std::vector<vxStringBase> converted;
+  CopyMarkedFiles(folder, pattern, extension, exclusions.c_str(), &convert, &converted);
   if (CopiesProfileDataFolders()) CopyDataFolders(*this, relative, type, exclusions);
-  RewriteProfiles(*this, relative, pattern == nullptr ? "" : pattern);
+  RewriteProfiles(*this, relative, pattern == nullptr ? "" : pattern, converted);
   if (BothKeepCategories(*this, true)) {
     MergeCategoriesINIFile(folder, pattern, extension, exclusions.c_str(), false);
   }

@@ -17,7 +17,7 @@
 #include "foundation/files/folder_lock.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/shared_lib.h"
-#include "foundation/inifile/ini_disk.h"
+#include "foundation/files/atomic_file.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/run_record.h"
 #include "src/proc2/proc2.h"
@@ -227,9 +227,9 @@ void vxMigrationManager::FinishRun(int status) {
   const std::string path = GetReportPath();
   if (!path.empty() && m_log != nullptr && m_log->IsOpen()) {
     const std::string text = m_record->ReportText(m_pluginSearch.ran);
-    vxini::ReplaceTarget target;
-    vxini::AtomicFileWriter writer;
-    if (!vxini::ResolveReplaceTarget(path, &target) || !writer.Begin(target) ||
+    vxfiles::ReplaceTarget target;
+    vxfiles::AtomicFileWriter writer;
+    if (!vxfiles::ResolveReplaceTarget(path, &target) || !writer.Begin(target) ||
         !writer.Append(text) || !writer.Commit(false)) {
       Log("Error: Unable to write file:   ", path.c_str());
     }

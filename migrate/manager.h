@@ -13,8 +13,10 @@
 #define VXMIGRATE_MIGRATE_MANAGER_H_
 
 #include <cstdint>
+#include <functional>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "foundation/export.h"
 #include "foundation/files/log_file.h"
@@ -36,6 +38,7 @@ struct vxMigrateInfo {
 
 class vxMigrationManager;
 class vxFolderLock;
+class vxMappedINIFile;
 class vxRunDoors;
 class vxRunRecord;
 class vxIniMergeObserver;
@@ -215,6 +218,13 @@ class VXM_EXPORT vxMigrationManager {
   void WriteHeader(vxRunListener* listener);
   void NoteEntry(const std::string& entry);
   void RunPlugins(bool& found);
+  // CopyRenamedUserFiles, each marked copy converted on its way when convert is given. A false
+  // from convert carries the file as it is, and the error text it left (followed by the copy's
+  // path) is logged after the copy's line. The paths of the copies made are added to made.
+  using MarkedCopyConversion = std::function<bool(vxMappedINIFile&, std::string& declined)>;
+  void CopyMarkedFiles(const char* folder, const char* pattern, const char* extension,
+                       const char* exclusions, const MarkedCopyConversion* convert,
+                       std::vector<vxStringBase>* made);
   void RunInstallScript();
 
   vxStringBase m_sourceVersion;

@@ -7,10 +7,11 @@
 
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
-#include "foundation/files/resolved_path.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/manager.h"
 #include "migrate/sample_lists.h"
 
@@ -29,8 +30,8 @@ bool IsInstallationProfileFolder(const vxStringBase& folder) {
   return folder.at(0) == '.' && (folder.at(1) == '/' || folder.at(2) == '\\');
 }
 
-// The folders that carry one profile's data, copied beside its copy. Returns the last path written.
-vxStringBase CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
+// The folders that carry one profile's data, copied beside its copy.
+void CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
                              const vxStringBase& newBase, const vxStringBase& newName) {
   vxStringBase reportsFrom, reportsTo;
   vxFileManager::MakePath(reportsFrom, manager.GetSourceDirectory(), kReports, profile.Filename());
@@ -44,18 +45,15 @@ vxStringBase CopyProfileData(vxMigrationManager& manager, const vxFilename& prof
   vxFileManager::MakePath(databaseTo, manager.GetDestinationDirectory(), kDatabases, newBase);
   vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
   manager.Log("Database folder copied: ", databaseTo.c_str());
-  return databaseTo;
 }
 
-// A profile without its report folders creates its reports on demand unless it says otherwise.
-// After the folders were copied the last path is the database folder, which does not open as a
-// profile: the default then stays unset, as the folders carry the reports.
-void DefaultToReportsOnDemand(const vxStringBase& lastWritten) {
-  vxMappedINIFile copy(lastWritten);
-  if (copy.Open(1) == 0 && copy.GetVal("profile", "ondemandreports").isEmpty()) {
-    copy.SetVal("profile", "ondemandreports", "0");
-    copy.Close(1);
+// A profile without its report folders creates its reports on demand unless it says otherwise;
+// one whose folders travel with it keeps its setting, as the folders carry the reports.
+bool DefaultToReportsOnDemand(vxMappedINIFile& profile, bool withData) {
+  if (!withData && profile.GetVal("profile", "ondemandreports").isEmpty()) {
+    profile.SetVal("profile", "ondemandreports", "0");
   }
+  return true;
 }
 
 }  // namespace
@@ -106,12 +104,17 @@ int vxMigrationManager::DoCopyOBXProfiles() {
 
     vxStringBase from;
     vxFileManager::MakePath(from, sourceProfiles, vxStringBase::NullStr, name);
-    const int copied = vxFileManager::CopyFile(ResolvedCopySource(from), target, 0, 1, 0, 0, 0,
-                                               nullptr, nullptr);
+    // Converted on its way and written once: a kill never leaves a copy without its default.
+    const vxConvertedCopy outcome = WriteConvertedCopy(from, target, [copyData](vxMappedINIFile& p) {
+      return DefaultToReportsOnDemand(p, copyData);
+    });
+    if (outcome == vxConvertedCopy::kExists) continue;
+    if (outcome == vxConvertedCopy::kFailed) {
+      vxLogFailedCopy(*this, from, target);
+      continue;
+    }
     Log("Profile copied: ", target.c_str());
-
-    const bool withData = copied == 0 && copyData;
-    DefaultToReportsOnDemand(withData ? CopyProfileData(*this, file, newBase, newName) : target);
+    if (copyData) CopyProfileData(*this, file, newBase, newName);
   }
   return 0;
 }

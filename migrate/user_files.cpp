@@ -6,7 +6,9 @@
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/converted_copy.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/manager.h"
 
@@ -16,19 +18,17 @@ const char kEventSection[] = "Main";
 const char kSetNameKey[] = "SetName";
 const char kSetExtensionKey[] = "SetExtension";
 
-// What became of one scheduled event.
-enum class EventOutcome { kKept, kDropped, kUnreadable };
+// What becomes of one scheduled event.
+enum class EventOutcome { kKept, kDropped };
 
 // Points the event's "SetName" at the marked copy of its set when the name falls under prefix;
-// drops the event when that marked copy is not in the destination folder.
-EventOutcome RedirectEvent(const vxStringBase& eventPath, const vxStringBase& prefix,
+// drops the event when that marked copy is not in the destination folder. Changes the event in
+// memory only.
+EventOutcome RedirectEvent(vxMappedINIFile& event, const vxStringBase& prefix,
                            const vxStringBase& destinationFolder) {
-  vxMappedINIFile event(eventPath);
-  if (event.Open(0) != 0) return EventOutcome::kUnreadable;
   vxStringBase setName = event.GetVal(kEventSection, kSetNameKey);
   if (setName.isEmpty() || !setName.beginsWith(prefix.view(), true)) {
-    event.Close(0);  // nothing changed: the copy stays byte for byte
-    return EventOutcome::kKept;
+    return EventOutcome::kKept;  // nothing changed: the copy stays byte for byte
   }
   vxStringBase markedName = MarkedBaseName(setName);
   vxStringBase setFile(markedName);
@@ -36,19 +36,23 @@ EventOutcome RedirectEvent(const vxStringBase& eventPath, const vxStringBase& pr
   setFile.append(event.GetVal(kEventSection, kSetExtensionKey));
   vxStringBase setPath;
   vxFileManager::MakePath(setPath, destinationFolder, setFile, 1);
-  if (!vxFileManager::Exists(setPath)) {
-    event.Close(0);
-    return EventOutcome::kDropped;
-  }
+  if (!vxFileManager::Exists(setPath)) return EventOutcome::kDropped;
   event.SetVal(kEventSection, kSetNameKey, markedName);
-  return event.Close(1) == 0 ? EventOutcome::kKept : EventOutcome::kUnreadable;
+  return EventOutcome::kKept;
 }
 
 }  // namespace
 
 int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pattern,
                                              const char* extension, const char* exclusions) {
-  if (IsInPlaceMigrate()) return 0;
+  CopyMarkedFiles(folder, pattern, extension, exclusions, nullptr, nullptr);
+  return 0;
+}
+
+void vxMigrationManager::CopyMarkedFiles(
+    const char* folder, const char* pattern, const char* extension, const char* exclusions,
+    const MarkedCopyConversion* convert, std::vector<vxStringBase>* made) {
+  if (IsInPlaceMigrate()) return;
   const vxStringBase relative(folder);
   vxStringBase sourceFolder;
   vxFileManager::MakePath(sourceFolder, m_sourceDirectory, relative, 0);
@@ -68,11 +72,36 @@ int vxMigrationManager::CopyRenamedUserFiles(const char* folder, const char* pat
       Log("File exists - no copy made: ", destination.c_str());
       continue;
     }
-    // Logged as copied whatever the copy answered: the later steps look at what is there.
-    vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
-    Log("File copied:  ", destination.c_str());
+    if (convert == nullptr) {
+      // Logged as copied whatever the copy answered: the later steps look at what is there.
+      vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
+      Log("File copied:  ", destination.c_str());
+      if (made != nullptr) made->push_back(destination);
+      continue;
+    }
+    std::string declined;
+    const vxConvertedCopy outcome = WriteConvertedCopy(
+        source, destination, [&](vxMappedINIFile& content) { return (*convert)(content, declined); });
+    switch (outcome) {
+      case vxConvertedCopy::kExists:
+        Log("File exists - no copy made: ", destination.c_str());
+        break;
+      case vxConvertedCopy::kFailed:
+        vxLogFailedCopy(*this, source, destination);
+        break;
+      case vxConvertedCopy::kNotSettings:
+        Log("File copied:  ", destination.c_str());
+        Log("Error: Profile is not a valid settings file - left as copied: ", destination.c_str());
+        if (made != nullptr) made->push_back(destination);
+        break;
+      case vxConvertedCopy::kConverted:
+      case vxConvertedCopy::kDeclined:
+        Log("File copied:  ", destination.c_str());
+        if (!declined.empty()) Log(declined.c_str(), destination.c_str());
+        if (made != nullptr) made->push_back(destination);
+        break;
+    }
   }
-  return 0;
 }
 
 int vxMigrationManager::CopyScheduledEventFiles(const char* folder, const char* pattern,
@@ -100,20 +129,25 @@ int vxMigrationManager::CopyScheduledEventFiles(const char* folder, const char* 
       Log("File exists - no copy made:  ", copy.c_str());
       continue;
     }
-    if (vxFileManager::CopyFile(source, copy, 0, 1, 0, 0, 0, nullptr, nullptr) != 0) {
-      Log("Error: Schedule Event could not be copied: ", source.c_str());
+    // Decided and pointed at its set in memory, then written once: a dropped event is never
+    // written, and a kill never leaves one pointing at the old set.
+    vxMappedINIFile event(source);
+    if (event.Open(0) != 0) {
+      if (vxFileManager::CopyFile(source, copy, 0, 0, 0, 0, 0, nullptr, nullptr) != 0) {
+        Log("Error: Schedule Event could not be copied: ", source.c_str());
+      } else {
+        Log("Error: Schedule Event could not be rewritten - left as copied: ", copy.c_str());
+      }
       continue;
     }
-    switch (RedirectEvent(copy, prefix, destinationFolder)) {
-      case EventOutcome::kKept:
-        Log("Schedule Event copied:  ", copy.c_str());
-        break;
-      case EventOutcome::kDropped:
-        vxFileManager::DeleteFile(copy, 0);
-        break;
-      case EventOutcome::kUnreadable:
-        Log("Error: Schedule Event could not be rewritten - left as copied: ", copy.c_str());
-        break;
+    if (RedirectEvent(event, prefix, destinationFolder) == EventOutcome::kDropped) continue;
+    const int written = event.CreateAs(copy);
+    if (written == 2) {
+      Log("File exists - no copy made:  ", copy.c_str());
+    } else if (written != 0) {
+      Log("Error: Schedule Event could not be copied: ", source.c_str());
+    } else {
+      Log("Schedule Event copied:  ", copy.c_str());
     }
   }
   return 0;

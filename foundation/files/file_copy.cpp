@@ -252,6 +252,7 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
     job.failed = true;
     return;
   }
+  if (!fresh) vxfiles::RemoveStaleTempsAt(dstFd);  // what a killed run left here
   job.openFolders.push_back(id);
   CopyFolderContents(job, srcFd, dstFd, fresh, depth);
   job.openFolders.pop_back();
@@ -292,6 +293,10 @@ int OpenDestinationFolder(const std::string& path, bool& fresh) {
   fresh = false;
   if (!vxfiles::MayWriteInto(path)) return -1;
   std::string folder = TrimFolder(path);
+  // Opened first: a run copying thousands of files into one folder makes it once, never asks
+  // mkdir again.
+  int fd = open(folder.c_str(), kOpenFolder);
+  if (fd >= 0 || errno != ENOENT) return fd;
   fresh = mkdir(folder.c_str(), 0777) == 0;
   if (!fresh && errno == ENOENT) {
     fresh = vxFileManager::CreateDirectory(vxStringBase(std::string_view(folder)), nullptr) == 0;

@@ -5,6 +5,7 @@
 #include "foundation/files/run_doors.h"
 
 #include <errno.h>
+#include <fcntl.h>
 #include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -13,6 +14,7 @@
 #include <vector>
 
 #include "foundation/files/file_manager.h"
+#include "foundation/files/temp_file.h"
 
 namespace {
 
@@ -155,6 +157,7 @@ bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view pat
   }
   switch (Locate(real)) {
     case Within::kDestination:
+      SweepOnce(real);
       return true;
     case Within::kSource:
       Refuse("Error: Refused to write inside the source installation: ", path);
@@ -164,6 +167,16 @@ bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view pat
   }
   Refuse("Error: Refused to write outside the destination installation: ", path);
   return false;
+}
+
+// The first write into a folder of the destination clears the temporary files a killed run left
+// there; the destination lock keeps any live run's own out of the way.
+void vxRunDoors::SweepOnce(const std::string& realFolder) {
+  if (!swept_.insert(realFolder).second) return;
+  const int fd = open(realFolder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (fd < 0) return;
+  vxfiles::RemoveStaleTempsAt(fd);
+  close(fd);
 }
 
 bool vxRunDoors::AdmitWrite(std::string_view path) {

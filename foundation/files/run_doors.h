@@ -14,6 +14,7 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <unordered_set>
 
 #include "foundation/export.h"
 #include "foundation/string/string_base.h"
@@ -92,6 +93,7 @@ class VXM_EXPORT vxRunDoors {
   Within Locate(const std::string& realFolder);
   bool IsInstallationText(const std::string& path) const;
   void Refuse(const char* text, std::string_view path) const;
+  void SweepOnce(const std::string& realFolder);
 
   Reporter reporter_;
   std::string sourceText_;
@@ -103,6 +105,7 @@ class VXM_EXPORT vxRunDoors {
   bool inPlace_ = false;
   bool destinationInsideSource_ = false;
   std::unordered_map<std::string, Within> located_;  // real folder -> first installation above it
+  std::unordered_set<std::string> swept_;            // destination folders cleared of stale temps
   vxRunDoors* previous_ = nullptr;
   vxWriteObserver* observer_ = nullptr;
 };

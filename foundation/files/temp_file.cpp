@@ -7,6 +7,7 @@
 
 #include "foundation/files/temp_file.h"
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <stdio.h>
 #include <sys/stat.h>
@@ -17,6 +18,9 @@
 #include <cerrno>
 #include <cstdint>
 #include <cstring>
+#include <vector>
+
+#include "foundation/files/dir_entries.h"
 
 namespace vxfiles {
 
@@ -99,6 +103,37 @@ int CommitTempAt(int dirFd, const char* tempName, const char* name, bool replace
     return -1;
   }
   return renameat(dirFd, tempName, dirFd, name);
+}
+
+bool IsTempName(const std::string& name) {
+  static const char kMark[] = ".vxtmp.";
+  const size_t mark = sizeof kMark - 1;
+  if (name.size() < 1 + mark + 6 || name[0] != '.') return false;
+  if (name.compare(name.size() - 6 - mark, mark, kMark) != 0) return false;
+  for (size_t i = name.size() - 6; i < name.size(); ++i) {
+    const char c = name[i];
+    if (!((c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z') || (c >= '0' && c <= '9'))) return false;
+  }
+  return true;
+}
+
+int RemoveStaleTempsAt(int dirFd) {
+  // A descriptor of its own: reading a folder moves the reader's position.
+  const int listFd = openat(dirFd, ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (listFd < 0) return 0;
+  std::vector<DirEntry> entries;
+  std::vector<char> buffer;
+  ReadDirEntries(listFd, entries, buffer);
+  close(listFd);
+  int removed = 0;
+  for (const DirEntry& entry : entries) {
+    if (!IsTempName(entry.name)) continue;
+    const unsigned char type = ResolveType(dirFd, entry);
+    if ((type == DT_REG || type == DT_LNK) && unlinkat(dirFd, entry.name.c_str(), 0) == 0) {
+      ++removed;
+    }
+  }
+  return removed;
 }
 
 }  // namespace vxfiles

@@ -25,6 +25,14 @@ int CreateTempLinkAt(int dirFd, const char* name, const char* target, std::strin
 // is left for the caller to remove when this fails. 0 on success, -1 and errno on failure.
 int CommitTempAt(int dirFd, const char* tempName, const char* name, bool replace);
 
+// True for a name this project gives its temporary entries (".name.vxtmp.XXXXXX").
+bool IsTempName(const std::string& name);
+
+// Removes the temporary files and links that an earlier, killed run left in the folder open at
+// dirFd: only entries named as ours, never folders. The folder lock keeps a live run's own
+// temporary entries out of a sweep. Returns how many were removed.
+int RemoveStaleTempsAt(int dirFd);
+
 }  // namespace vxfiles
 
 #endif  // VXMIGRATE_FOUNDATION_FILES_TEMP_FILE_H_

@@ -25,12 +25,40 @@ void vxMappedINIFile::SetFilename(const vxStringBase& filename) {
   filename_ = filename;
 }
 
+void vxMappedINIFile::CopyFrom(const vxMappedINIFile& other) {
+  if (&other == this) return;
+  Clear();
+  loaded_ = false;
+  text_ = other.text_;  // immutable and shared: the lines' layout points into it
+  preambleEnd_ = other.preambleEnd_;
+  fileEol_ = other.fileEol_;
+  loadedMode_ = other.loadedMode_;
+  for (const auto& from : other.sections_) {
+    auto section = std::make_unique<Section>();
+    section->name = from->name;
+    section->headerPrefix = from->headerPrefix;
+    section->headerSuffix = from->headerSuffix;
+    section->nameFromCaller = from->nameFromCaller;
+    section->headerEol = from->headerEol;
+    section->trailingBegin = from->trailingBegin;
+    section->trailingEnd = from->trailingEnd;
+    section->carriedTrailing = from->carriedTrailing;
+    section->lines.reserve(from->lines.size());
+    for (const INILine* line : from->lines) {
+      if (line != nullptr) section->lines.push_back(new INILine(*line));
+    }
+    sections_.push_back(std::move(section));
+    IndexSection(sections_.back().get());
+  }
+}
+
 void vxMappedINIFile::Clear() {
   sectionIndex_.clear();  // its keys point into the sections
   sectionExact_.clear();
   sections_.clear();
   text_.reset();
   preambleEnd_ = 0;
+  loadedMode_ = 0;
   fileEol_ = vxini::Eol::kLF;
   duplicateSections_ = 0;
 }

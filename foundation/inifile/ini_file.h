@@ -8,6 +8,8 @@
 #ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
 #define VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
 
+#include <sys/types.h>
+
 #include <memory>
 #include <string>
 #include <string_view>
@@ -52,11 +54,22 @@ class VXM_EXPORT vxMappedINIFile {
   int Open(unsigned int flag = 1);
 
   // save 1: writes the sections back atomically (temporary file in the same folder, then rename;
-  // the file's mode kept). save 0: drops the changes. Returns 0 on success; 1 when writing failed or
-  // was refused because the file exists but was not loaded by this object.
+  // the file's mode kept); a loaded file whose content did not change is left untouched. save 0:
+  // drops the changes. Returns 0 on success; 1 when writing failed or was refused because the
+  // file exists but was not loaded by this object.
   int Close(unsigned int save);
   // As Close, and with save 1 the file and its folder are also flushed to disk before returning.
   int CloseFW(unsigned int save);
+
+  // Writes the sections to path as a new file, atomically, and never replaces an entry already
+  // there (nor one that appears meanwhile). The file takes the mode of the file the content was
+  // read from, else 0666 less the umask; missing folders are made. The object stays bound to its
+  // own name. 0 written; 1 failed; 2 path exists and was left as it is.
+  int CreateAs(const vxStringBase& path);
+
+  // Makes this object a copy of other's content (sections, lines, layout) in memory, as if read
+  // from the same text; its own name stays, and it counts as not loaded from it.
+  void CopyFrom(const vxMappedINIFile& other);
 
   // The value, or an empty text when the section or key is absent (nothing is created).
   const vxStringBase& GetVal(const vxStringBase& section, const vxStringBase& key) const;
@@ -116,9 +129,11 @@ class VXM_EXPORT vxMappedINIFile {
   void CopyMissingKeys(Section& section, const INILineList& lines);
   void Clear();
   int Write(bool flushToDisk);
+  bool SameAsLoaded() const;
 
   vxStringBase filename_;
   bool loaded_ = false;
+  mode_t loadedMode_ = 0;  // permission bits of the file the content was read from; 0: none
   std::shared_ptr<const std::string> text_;  // the file as read; sections point into it
   uint32_t preambleEnd_ = 0;                 // [0, preambleEnd_): lines before the first section
   vxini::Eol fileEol_ = vxini::Eol::kLF;     // line end for new lines: the file's first, else LF

@@ -1,15 +1,22 @@
 // Writing an INI file back: every piece that was read is given back byte for byte, a changed key or
 // value is spliced into its line between the line's own spacing, and new lines end like the file's
-// first line. Close(1) never replaces an existing file this object did not load.
+// first line. Close(1) never replaces an existing file this object did not load, and leaves a
+// loaded file alone when nothing in it changed; CreateAs never replaces anything.
 
-#include "foundation/inifile/ini_disk.h"
+#include <cerrno>
+#include <functional>
+
+#include "foundation/files/atomic_file.h"
 #include "foundation/inifile/ini_file.h"
 #include "foundation/inifile/ini_section.h"
 
 class INIFileWriter {
  public:
-  INIFileWriter(const vxMappedINIFile& file, vxini::AtomicFileWriter& out)
-      : file_(file), out_(out), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
+  // Receives the rendered text in order, a chunk at a time; false stops the rendering.
+  using Sink = std::function<bool(std::string_view)>;
+
+  INIFileWriter(const vxMappedINIFile& file, Sink sink)
+      : file_(file), sink_(std::move(sink)), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
     if (file.text_) text_ = *file.text_;
     buffer_.reserve(kChunk + 4096);
   }
@@ -37,7 +44,7 @@ class INIFileWriter {
   }
 
   const vxMappedINIFile& file_;
-  vxini::AtomicFileWriter& out_;
+  Sink sink_;
   std::string_view fileEol_;
   std::string_view text_;
   std::string buffer_;
@@ -48,7 +55,7 @@ class INIFileWriter {
 };
 
 void INIFileWriter::Flush() {
-  if (!buffer_.empty()) ok_ = out_.Append(buffer_) && ok_;
+  if (ok_ && !buffer_.empty()) ok_ = sink_(buffer_);
   buffer_.clear();
 }
 
@@ -97,20 +104,50 @@ bool INIFileWriter::Render() {
   return ok_;
 }
 
+// Renders the content and compares it with the text it was read from, without writing anything.
+bool vxMappedINIFile::SameAsLoaded() const {
+  if (!text_) return false;
+  const std::string& original = *text_;
+  size_t offset = 0;
+  INIFileWriter compare(*this, [&](std::string_view chunk) {
+    if (original.compare(offset, chunk.size(), chunk) != 0) return false;
+    offset += chunk.size();
+    return true;
+  });
+  return compare.Render() && offset == original.size();
+}
+
 int vxMappedINIFile::Write(bool flushToDisk) {
   int result = 1;
   try {
-    vxini::ReplaceTarget target;
+    vxfiles::ReplaceTarget target;
     // An existing file that was never loaded (or failed to load) is not ours to replace.
-    if (vxini::ResolveReplaceTarget(filename_.str(), &target) && (loaded_ || !target.exists)) {
-      vxini::AtomicFileWriter out;
-      INIFileWriter writer(*this, out);
+    if (vxfiles::ResolveReplaceTarget(filename_.str(), &target) && (loaded_ || !target.exists)) {
+      // Unchanged: a rewrite would only cost a new inode and lose the file's times.
+      if (loaded_ && target.exists && SameAsLoaded()) return 0;
+      vxfiles::AtomicFileWriter out;
+      INIFileWriter writer(*this, [&out](std::string_view chunk) { return out.Append(chunk); });
       if (out.Begin(target) && writer.Render() && out.Commit(flushToDisk)) result = 0;
     }
   } catch (...) {
     result = 1;
   }
   return result;
+}
+
+int vxMappedINIFile::CreateAs(const vxStringBase& path) {
+  try {
+    vxfiles::ReplaceTarget target;
+    target.path = path.str();
+    target.mode = loadedMode_ != 0 ? loadedMode_ : vxfiles::NewFileMode();
+    vxfiles::AtomicFileWriter out;
+    INIFileWriter writer(*this, [&out](std::string_view chunk) { return out.Append(chunk); });
+    if (!out.Begin(target, true) || !writer.Render()) return 1;
+    if (out.Commit(false, false)) return 0;
+    return errno == EEXIST ? 2 : 1;
+  } catch (...) {
+    return 1;
+  }
 }
 
 int vxMappedINIFile::Close(unsigned int save) {

@@ -185,7 +185,26 @@ INSTANTIATE_TEST_SUITE_P(Cases, EditionStep, testing::Values(
          "LogFilePassword={legacy:pw}\n",
          "[wdwexport]\nwarehousedsn=Sales\nwarehouseusername=dw\nwarehousepassword={protected:pw}",
          "tradeq"},
-    Case{&kProfile, "3.0", "[Profile]\nLogFilePath=warehouse:Sales\n", "![wdwexport]"}));
+    Case{&kProfile, "3.0", "[Profile]\nLogFilePath=warehouse:Sales\n", "![wdwexport]"},
+    // The server's and the warehouse's user names are two keys that differ in case alone.
+    Case{&kProfile, "3.0",
+         "[Profile]\nLogFilePath=warehouse:Sales\nLogFileUserName={legacy:srv}\n"
+         "LogFileUsername={legacy:dw}\n",
+         "LogFileUserName=srv\nLogFileUsername={legacy:dw}", "tradeq"},
+    Case{&kProfile, "3.0",
+         "[Profile]\nLogFilePath=warehouse:Sales\nLogFileUserName={legacy:srv}\n"
+         "LogFileUsername={legacy:dw}\n",
+         "warehouseusername=dw", "tradeq"},
+    // A file URL loses its scheme; a drive letter path keeps no leading slash, an absolute path
+    // keeps its own. So do the paths of each cluster server.
+    Case{&kProfile, "3.0", "[Profile]\nLogFilePath=file:///C:/logs/a.log\n",
+         "LogFilePath=C:/logs/a.log"},
+    Case{&kProfile, "3.0", "[Profile]\nLogFilePath=file:///var/log/a.log\n",
+         "LogFilePath=/var/log/a.log"},
+    Case{&kProfile, "3.0",
+         "[Profile]\nIsServerCluster=1\nServerName=n1\n"
+         "LogFilePath=file:///d:/l/a.log|file:///var/b.log\n",
+         "logfilepath1=d:/l/a.log\nlogfilepath2=/var/b.log"}));
 
 // Dynamic-page query profiles take the destination version's layout: before 3 the Halden profiles
 // whose id the OBX file lacks are added, from 3 on each profile's first qualification is filled.

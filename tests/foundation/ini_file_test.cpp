@@ -179,6 +179,41 @@ TEST(IniFile, UnreadableFilesAreRefusedAndNeverReplaced) {
   }
 }
 
+// A conversion reads one file, changes a copy in memory and writes the result once under a new
+// name: never over what is there, with the source's mode; an unchanged file is never rewritten.
+TEST(IniFile, CreateAsWritesOnceAndCopiesInMemoryStayApart) {
+  vxtest::TempDir dir;
+  WriteFile(dir.Path("standard.ini"), "; keep\n[a]\nk=1\n");
+  ASSERT_EQ(0, chmod(dir.Path("standard.ini").c_str(), 0640));
+  Ini standard(dir.Path("standard.ini").c_str());
+  ASSERT_EQ(0, standard.Open(1));
+  Ini copy;
+  copy.CopyFrom(standard);
+  copy.SetVal("a", "k", "2");
+  copy.SetVal("b", "n", "3");
+  EXPECT_EQ("1", standard.GetVal("a", "k").str());
+  EXPECT_EQ(0, copy.CreateAs(dir.Path("converted.ini").c_str()));
+  EXPECT_EQ("; keep\n[a]\nk=2\n[b]\nn=3\n", ReadFile(dir.Path("converted.ini")));
+  struct stat st;
+  ASSERT_EQ(0, stat(dir.Path("converted.ini").c_str(), &st));
+  EXPECT_EQ(0640u, st.st_mode & 07777);
+  WriteFile(dir.Path("taken.ini"), "theirs\n");
+  EXPECT_EQ(2, copy.CreateAs(dir.Path("taken.ini").c_str()));
+  EXPECT_EQ("theirs\n", ReadFile(dir.Path("taken.ini")));
+  EXPECT_EQ(0, copy.CreateAs(dir.Path("new/folder/made.ini").c_str()));
+  EXPECT_EQ(1, copy.CreateAs(dir.Path("taken.ini/below.ini").c_str()));  // a file on the way
+  EXPECT_EQ((Names{"converted.ini", "new", "new/folder", "new/folder/made.ini", "standard.ini",
+                   "taken.ini"}),
+            vxtest::ListTree(dir.path()));
+
+  struct stat before;
+  ASSERT_EQ(0, stat(dir.Path("standard.ini").c_str(), &before));
+  standard.SetVal("a", "k", "1");  // the same value: nothing changed
+  EXPECT_EQ(0, standard.Close(1));
+  ASSERT_EQ(0, stat(dir.Path("standard.ini").c_str(), &st));
+  EXPECT_EQ(before.st_ino, st.st_ino);
+}
+
 TEST(IniFile, CloseCreatesAMissingFileButNeverReplacesOneItDidNotLoad) {
   vxtest::TempDir dir;
   WriteFile(dir.Path("a.ini"), "[a]\nk=1\n");

@@ -89,11 +89,12 @@ TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTh
             run.DestinationTree());
   EXPECT_EQ((Entries{own, binary, tooLong}),
             run.ReadDst({"p/own.wlp", "p/a_vxmigrate.wlp", "p/b_vxmigrate.wlp"}));
+  // Each copy is converted on its way, so its trouble follows its own line.
   EXPECT_EQ((Entries{"File copied:  <dst>/p/a_vxmigrate.wlp",
-                     "File copied:  <dst>/p/b_vxmigrate.wlp",
                      "Error: Profile is not a valid settings file - left as copied: "
                      "<dst>/p/a_vxmigrate.wlp",
                      "Error: Value too long to protect - left unchanged, characters: 600",
+                     "File copied:  <dst>/p/b_vxmigrate.wlp",
                      "Error: Value of LogFilePassword cannot be protected - profile left as "
                      "copied: <dst>/p/b_vxmigrate.wlp"}),
             run.RunLog());

@@ -121,12 +121,12 @@ std::string ClimbTo(const std::string& target) {
 }
 
 TEST(Containment, ADestinationThatReachesIntoTheSourceIsRefusedAndNothingIsWritten) {
-  for (const std::string& route : {"link", "dots"}) {
+  for (const char* route : {"link", "dots"}) {
     Samples s;
     ASSERT_EQ(0, system(("cp -a '" + s.obx + "' '" + s.halden + "/obx2'").c_str()));
     const Tree source = TreeState(s.halden);
     std::string destination = s.outside + "/../halden/obx2";
-    if (route == "link") {
+    if (std::string(route) == "link") {
       s.Link(s.Path("lnk"), s.halden + "/obx2");
       destination = s.Path("lnk");
     }
@@ -147,7 +147,7 @@ TEST(Containment, LinksInTheSourceToFilesElsewhereAreLeftOutAndNamed) {
   s.Run(s.obx);
   EXPECT_FALSE(Samples::AnyFileHolds(s.obx, "SECRET"));
   const Lines log = LogEntries(s.obx + "/vxmigrate.log");
-  for (const std::string& name : {"/vxintra.txt", "/vxm_log/datfiles/shadow.wlp"}) {
+  for (const char* name : {"/vxintra.txt", "/vxm_log/datfiles/shadow.wlp"}) {
     const std::string line =
         "Error: Refused to read a file that leads outside the installations: " + s.halden + name;
     EXPECT_NE(log.end(), std::find(log.begin(), log.end(), line)) << line;

@@ -3,8 +3,11 @@
 // that changes nothing; one log entry per line whatever a file name holds.
 
 #include <gtest/gtest.h>
+#include <limits.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
+#include <cstring>
 #include <filesystem>
 #include <map>
 #include <string>
@@ -129,9 +132,10 @@ TEST(HostReport, EveryFailedReadOrWriteNamesItsFile) {
   }
 }
 
-// Paths beyond the system's limit: a destination folder so deep that the converted profiles'
-// paths no longer fit. Each profile that could not be written gets its own error line.
-TEST(HostReport, PathsBeyondTheLengthLimitAreReported) {
+// Paths near the system's limit: a destination folder so deep that the converted profiles'
+// temporary files' paths would not fit. Files are written relative to their open folder, so the
+// profiles still arrive, and the run reports no error.
+TEST(HostReport, PathsNearTheLengthLimitStillTakeTheirFiles) {
   HostRun run({"halden_to_obx"});
   std::string deep = run.dst;
   while (deep.size() < 3800) deep += "/" + std::string(200, 'd');
@@ -143,10 +147,11 @@ TEST(HostReport, PathsBeyondTheLengthLimitAreReported) {
   std::filesystem::copy(VXM_SOURCE_DIR "/samples/obx", deep, std::filesystem::copy_options::recursive);
   Lines options = run.SampleOptions();
   options[1] = "-D2:" + deep;
-  EXPECT_EQ(4, run.Run(options));
+  EXPECT_EQ(0, run.Run(options)) << run.Err();
   for (const char* profile : {"cluster", "shop"}) {
     const std::string target = deep + "/vxm_vxx/datfiles/profiles/" + profile + "_vxmigrate.wlp";
-    EXPECT_TRUE(Has(run.Err(), "Error: Unable to write file:   " + target + "\n")) << profile;
+    EXPECT_GT(target.size() + strlen(".x.vxtmp.XXXXXX"), static_cast<size_t>(PATH_MAX));
+    EXPECT_EQ(0, access(target.c_str(), F_OK)) << profile;
   }
 }
 
