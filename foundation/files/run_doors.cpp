@@ -151,7 +151,7 @@ bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view pat
     return false;
   }
   std::string real;
-  if (!ResolveFolder(folder, real)) {
+  if (!RealFolder(folder, real) && !ResolveFolder(folder, real)) {
     Refuse("Error: Refused to write where the path cannot be followed: ", path);
     return false;
   }
@@ -206,10 +206,32 @@ bool vxRunDoors::IsInstallationText(const std::string& path) const {
   return false;
 }
 
+// The real path of an existing folder, remembered by its text: a run asks about thousands of
+// files in a few folders, and resolving a path asks the kernel once per part of it.
+bool vxRunDoors::RealFolder(const std::string& folder, std::string& real) {
+  auto known = realFolders_.find(folder);
+  if (known != realFolders_.end()) {
+    real = known->second;
+    return true;
+  }
+  if (!RealPath(folder, real)) return false;
+  realFolders_.emplace(folder, real);
+  return true;
+}
+
 bool vxRunDoors::AdmitRead(std::string_view path) {
   const std::string text = AbsoluteText(path);
+  if (!IsInstallationText(text)) return true;
+  struct stat entry;
+  if (lstat(text.c_str(), &entry) != 0) return true;  // left to the reader to report as missing
   std::string real;
-  if (!IsInstallationText(text) || !RealPath(text, real)) return true;
+  if (!S_ISLNK(entry.st_mode) && !S_ISDIR(entry.st_mode) && text != "/") {
+    // A file that is no link lies in its folder: that folder decides.
+    if (!RealFolder(ParentOf(text), real) || Locate(real) != Within::kNeither) return true;
+    Refuse("Error: Refused to read a file that leads outside the installations: ", path);
+    return false;
+  }
+  if (!RealPath(text, real)) return true;
   struct stat st;
   if (stat(real.c_str(), &st) != 0) return true;
   const bool isRoot = (source_.known && st.st_dev == source_.dev && st.st_ino == source_.ino) ||

@@ -94,6 +94,7 @@ class VXM_EXPORT vxRunDoors {
   bool IsInstallationText(const std::string& path) const;
   void Refuse(const char* text, std::string_view path) const;
   void SweepOnce(const std::string& realFolder);
+  bool RealFolder(const std::string& folder, std::string& real);
 
   Reporter reporter_;
   std::string sourceText_;
@@ -106,6 +107,7 @@ class VXM_EXPORT vxRunDoors {
   bool destinationInsideSource_ = false;
   std::unordered_map<std::string, Within> located_;  // real folder -> first installation above it
   std::unordered_set<std::string> swept_;            // destination folders cleared of stale temps
+  std::unordered_map<std::string, std::string> realFolders_;  // folder text -> its real path
   vxRunDoors* previous_ = nullptr;
   vxWriteObserver* observer_ = nullptr;
 };
