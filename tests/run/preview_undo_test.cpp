@@ -12,6 +12,7 @@
 #include <algorithm>
 #include <string>
 
+#include "migrate/installations_fixture.h"
 #include "run/host_run.h"
 #include "support/test_files.h"
 
@@ -66,26 +67,55 @@ TEST(Preview, LeavesTheDestinationAsItWasAndReportsWhatTheRunThenDoes) {
   EXPECT_NE(std::string::npos, preview.find(real.substr(real.rfind("Files: ")))) << real;
 }
 
+// Lines added right after a section's header line, ending as that line ends (the Halden sample's
+// settings end their lines in "\r\n").
+std::string WithLinesAfter(const std::string& text, const std::string& header, const Lines& lines) {
+  const size_t at = text.find(header);
+  const size_t end = at == std::string::npos ? at : text.find('\n', at);
+  if (end == std::string::npos) {
+    ADD_FAILURE() << header << " not found";
+    return text;
+  }
+  const std::string lineEnd = text[end - 1] == '\r' ? "\r\n" : "\n";
+  std::string added;
+  for (const std::string& line : lines) added += line + lineEnd;
+  return text.substr(0, end + 1) + added + text.substr(end + 1);
+}
+
+// Protected values from the source reach the merge as added keys and as conflicts, under names
+// that do not say "password": the report must know them by their form.
 TEST(Report, NamesConflictsWithBothValuesAndMasksProtectedOnes) {
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   PlantConflict(run);
+  const std::string sourceAccount = Protected("stats-account"), sourceRelay = Protected("relay-user"),
+                    keptRelay = Protected("kept-user");
+  const std::string obx = run.dst + "/vxm_vxx/vxm_vxx.ini";
+  WriteFile(obx, WithLinesAfter(ReadFile(obx), "[Mail]", {"RelayUser=" + keptRelay}));
   const std::string halden = run.src + "/vxm_log/vxm_log.ini";
-  std::string settings = ReadFile(halden);
-  settings.insert(settings.find("[Mail]\n") + 7,
-                  "SmtpPassword=D9369CD16883E81D88BA98FB93B0DB4F7DAB\n"
-                  "Account=D94F4859206C3067E5EF5549BC4C8E82D9AB\n");
-  WriteFile(halden, settings);
+  WriteFile(halden, WithLinesAfter(ReadFile(halden), "[Mail]",
+                                   {"SmtpPassword=" + Protected("source-secret"),
+                                    "Account=" + sourceAccount, "RelayUser=" + sourceRelay}));
   ASSERT_EQ(0, run.Run(run.SampleOptions()));
   const std::string report = ReadFile(run.dst + "/vxmigrate-report.json");
-  EXPECT_NE(std::string::npos,
-            report.find("{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": "
-                        "\"mail.example.com\", \"kept\": \"relay.internal\"}")) << report;
-  for (const char* secret : {"D94F4859206C3067E5EF5549BC4C8E82D9AB", "D9369CD16883E81D88BA98FB93B0DB4F7DAB"}) {
-    EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
+  for (const char* expected :
+       {"{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": \"mail.example.com\", "
+        "\"kept\": \"relay.internal\"}",
+        "{\"section\": \"Mail\", \"key\": \"Account\", \"value\": \"<protected>\"}",
+        "{\"section\": \"Mail\", \"key\": \"RelayUser\", \"source\": \"<protected>\", "
+        "\"kept\": \"<protected>\"}",
+        "{\"section\": \"Mail\", \"key\": \"SmtpPassword\", \"source\": \"<protected>\", "
+        "\"kept\": \"<protected>\"}",
+        "{\"path\": \"vxm_vxx/vxm_vxx.ini\", \"action\": \"merged\", "
+        "\"source\": \"vxm_log/vxm_log.ini\"}"}) {
+    EXPECT_NE(std::string::npos, report.find(expected)) << expected << "\n" << report;
   }
-  EXPECT_NE(std::string::npos, report.find("{\"path\": \"vxm_vxx/vxm_vxx.ini\", \"action\": \"merged\", "
-                                           "\"source\": \"vxm_log/vxm_log.ini\"}"));
+  ASSERT_EQ(0, run.Run({"--report", run.dst}));
+  for (const std::string& secret : {sourceAccount, sourceRelay, keptRelay, Protected("source-secret"),
+                                    std::string("D94F4859206C3067E5EF5549BC4C8E82D9AB")}) {
+    EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
+    EXPECT_EQ(std::string::npos, run.Out().find(secret)) << secret;
+  }
 }
 
 TEST(Undo, GivesBackTheExactTreeAndKeepsTheUndoneLog) {
