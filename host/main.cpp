@@ -47,6 +47,7 @@ int Migrate(HostOptions& options, const vxRunSettings& settings, bool preview) {
                      strerror(log->OpenError()));
     return kExitRefused;
   }
+  report.ShowProgress(manager);
   manager.SetRunListener(&report);
   int result = manager.DoMigration();
   if (log->WriteError() != 0) {

@@ -286,6 +286,10 @@ std::string vxRunRecord::Action(const std::string& relative, const FileRecord& f
   return file.merged || mergedNamed_.count(relative) != 0 ? "merged" : "replaced";
 }
 
+long vxRunRecord::FilesWritten() const {
+  return static_cast<long>(files_.size() - files_.count(kLogName) - files_.count(kRunReportName));
+}
+
 std::string vxRunRecord::ReportText(const std::string& plugin) {
   std::map<std::string, long> counts;
   std::string list;
