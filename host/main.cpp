@@ -61,7 +61,7 @@ int Migrate(HostOptions& options, const vxRunSettings& settings, bool preview) {
 }
 
 // The whole migration into a scratch copy; the destination itself is only read. Its report's
-// summary and conflicts are printed.
+// summary and conflicts are printed (with -v the whole report, as --report shows it).
 int Preview(HostOptions& options) {
   vxFolderLock lock;
   if (int refused = LockDestination(lock, options.destination)) return refused;
@@ -84,7 +84,9 @@ int Preview(HostOptions& options) {
   if (options.verbosity != Verbosity::kQuiet && !text.empty()) {
     printf("Preview of the migration into %s (nothing there was changed):\n",
            options.destination.c_str());
-    PrintReport(text, ReportParts::kSummaryAndConflicts, stdout);
+    PrintReport(text, options.verbosity == Verbosity::kVerbose ? ReportParts::kWhole
+                                                                : ReportParts::kSummaryAndConflicts,
+                stdout);
   }
   return status;
 }

@@ -3,6 +3,7 @@
 // exact tree from before a run, also after a run killed midway; the report shows a planted
 // conflict with both values and never a protected value in clear.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/stat.h>
@@ -14,6 +15,7 @@
 
 #include "migrate/installations_fixture.h"
 #include "run/host_run.h"
+#include "run/sample_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -149,42 +151,96 @@ TEST(Undo, RefusesNamingFilesChangedSinceTheRunUnlessForced) {
   EXPECT_EQ(before, Installation(run.dst, false));
 }
 
+// Starts the host with args (args[0] its path) in folder, its output thrown away; and kills it
+// once the journal holds records lines, unless it ended first (then the run is undone whole).
+void KillWhenJournalHas(const std::string& folder, Lines args, const std::string& journal,
+                        int records) {
+  pid_t child = fork();
+  if (child == 0) {
+    std::vector<char*> argv;
+    for (std::string& arg : args) argv.push_back(arg.data());
+    argv.push_back(nullptr);
+    int null = open("/dev/null", O_WRONLY);
+    if (null < 0 || dup2(null, 1) < 0 || dup2(null, 2) < 0 || chdir(folder.c_str()) != 0) _exit(126);
+    execv(argv[0], argv.data());
+    _exit(127);
+  }
+  ASSERT_GT(child, 0);
+  // Polled for up to a minute (a loaded machine starts the host slowly).
+  int status = 0;
+  for (int i = 0; i < 60000; ++i) {
+    const std::string text = ReadFile(journal);
+    if (std::count(text.begin(), text.end(), '\n') >= records) break;
+    if (waitpid(child, &status, WNOHANG) == child) return;
+    usleep(1000);
+  }
+  kill(child, SIGKILL);
+  waitpid(child, &status, 0);
+}
+
 // Killed at whatever point its journal has reached a few changes: undo still gives the tree back.
 TEST(Undo, TakesBackARunKilledMidway) {
   for (int changes : {2, 5, 9}) {
     HostRun run({"halden_to_obx"});
     run.UseSamples();
     const auto before = Installation(run.dst, false);
-    pid_t child = fork();
-    if (child == 0) {
-      std::vector<std::string> args = {run.bin + "/vxmigrate"};
-      for (const std::string& option : run.SampleOptions()) args.push_back(option);
-      args.push_back("-q");
-      std::vector<char*> argv;
-      for (std::string& arg : args) argv.push_back(arg.data());
-      argv.push_back(nullptr);
-      execv(argv[0], argv.data());
-      _exit(127);
-    }
-    const std::string journal = run.dst + "/.vxmigrate/runs/000001/journal";
-    // Polled for up to a minute (a loaded machine starts the host slowly); a run that ends first
-    // is undone as a whole.
-    int status = 0;
-    bool ended = false;
-    for (int i = 0; i < 60000 && !ended; ++i) {
-      const std::string text = ReadFile(journal);
-      if (std::count(text.begin(), text.end(), '\n') >= changes + 2) break;
-      ended = waitpid(child, &status, WNOHANG) == child;
-      usleep(1000);
-    }
-    if (!ended) {
-      kill(child, SIGKILL);
-      waitpid(child, &status, 0);
-    }
+    Lines args = {run.bin + "/vxmigrate"};
+    for (const std::string& option : run.SampleOptions()) args.push_back(option);
+    KillWhenJournalHas(run.Path(""), args, run.dst + "/.vxmigrate/runs/000001/journal", changes + 2);
     ASSERT_EQ(0, run.Run({"--undo", run.dst})) << changes << run.Err();
     EXPECT_EQ(before, Installation(run.dst, false)) << changes;
   }
 }
+
+// Each shipped plug-in on copies of its samples, started with its command file's run as a whole
+// command line.
+class EveryShippedPlugin : public ::testing::TestWithParam<const char*> {};
+
+TEST_P(EveryShippedPlugin, PreviewLeavesTheDestinationAsItWasAndReportsWhatTheRunDoes) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, true);
+  Lines preview = run.RunOptions();
+  preview.insert(preview.end(), {"-n", "-v"});  // -v: the whole report, as --report shows it
+  ASSERT_EQ(0, run.Run(preview)) << run.Err();
+  EXPECT_EQ(before, Installation(dst, true));
+  const std::string title =
+      "Preview of the migration into " + run.destination + " (nothing there was changed):\n";
+  const size_t at = run.Out().find(title);
+  ASSERT_NE(std::string::npos, at) << run.Out();
+  const std::string previewed = run.Out().substr(at + title.size());
+  for (const std::string& name : ListTree(run.Path(""))) {
+    EXPECT_EQ(std::string::npos, name.find("vxpreview")) << name;
+  }
+
+  ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
+  ASSERT_EQ(0, run.Run({"--report", run.destination})) << run.Err();
+  EXPECT_EQ(run.Out(), previewed);
+  EXPECT_NE(std::string::npos, previewed.find("Files:\n  ")) << previewed;
+}
+
+TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeTheRun) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, false);
+  ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
+  ASSERT_NE(before, Installation(dst, false));
+  ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
+  EXPECT_EQ(before, Installation(dst, false));
+}
+
+TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeARunKilledMidway) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, false);
+  Lines args = {run.Path("bin/vxmigrate")};
+  for (const std::string& option : run.RunOptions()) args.push_back(option);
+  KillWhenJournalHas(run.Path(""), args, dst + "/.vxmigrate/runs/000001/journal", 6);
+  ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
+  EXPECT_EQ(before, Installation(dst, false));
+}
+
+INSTANTIATE_TEST_SUITE_P(Samples, EveryShippedPlugin, ::testing::ValuesIn(kShippedPlugins));
 
 }  // namespace
 }  // namespace vxtest
