@@ -15,6 +15,7 @@
 #include "host/terminal_report.h"
 #include "host/usage.h"
 #include "migrate/manager.h"
+#include "migrate/run_record.h"
 
 namespace {
 
@@ -73,13 +74,8 @@ int Preview(HostOptions& options) {
   settings.writeReport = true;
   settings.shownDestination = options.destination;
   const int status = Migrate(options, settings, true);
-  FILE* report = fopen((scratch + "/vxmigrate-report.json").c_str(), "rb");
   std::string text;
-  if (report != nullptr) {
-    char buffer[65536];
-    for (size_t n; (n = fread(buffer, 1, sizeof buffer, report)) > 0;) text.append(buffer, n);
-    fclose(report);
-  }
+  ReadWholeFile(scratch + "/" + kRunReportName, text);
   RemoveScratchCopy(scratch);
   if (options.verbosity != Verbosity::kQuiet && !text.empty()) {
     printf("Preview of the migration into %s (nothing there was changed):\n",

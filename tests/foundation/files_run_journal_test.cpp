@@ -143,7 +143,7 @@ TEST(RunJournal, UndoGivesBackTheTreeOrNamesWhatChangedSince) {
 }
 
 TEST(RunJournal, EscapedTextsComeBackWhole) {
-  for (const std::string text : {std::string("plain"), std::string("a b%c"),
+  for (const std::string& text : {std::string("plain"), std::string("a b%c"),
                                  std::string("\x01\n\r\t \x7f%%", 7), std::string("%2")}) {
     const std::string escaped = vxJournalEscape(text);
     EXPECT_EQ(std::string::npos, escaped.find_first_of(" \n\r\t")) << escaped;
