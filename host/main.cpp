@@ -15,6 +15,7 @@
 #include "host/terminal_report.h"
 #include "host/usage.h"
 #include "migrate/manager.h"
+#include "migrate/run_record.h"
 
 namespace {
 
@@ -47,6 +48,7 @@ int Migrate(HostOptions& options, const vxRunSettings& settings, bool preview) {
                      strerror(log->OpenError()));
     return kExitRefused;
   }
+  report.ShowProgress(manager);
   manager.SetRunListener(&report);
   int result = manager.DoMigration();
   if (log->WriteError() != 0) {
@@ -60,7 +62,7 @@ int Migrate(HostOptions& options, const vxRunSettings& settings, bool preview) {
 }
 
 // The whole migration into a scratch copy; the destination itself is only read. Its report's
-// summary and conflicts are printed.
+// summary and conflicts are printed (with -v the whole report, as --report shows it).
 int Preview(HostOptions& options) {
   vxFolderLock lock;
   if (int refused = LockDestination(lock, options.destination)) return refused;
@@ -72,18 +74,15 @@ int Preview(HostOptions& options) {
   settings.writeReport = true;
   settings.shownDestination = options.destination;
   const int status = Migrate(options, settings, true);
-  FILE* report = fopen((scratch + "/vxmigrate-report.json").c_str(), "rb");
   std::string text;
-  if (report != nullptr) {
-    char buffer[65536];
-    for (size_t n; (n = fread(buffer, 1, sizeof buffer, report)) > 0;) text.append(buffer, n);
-    fclose(report);
-  }
+  ReadWholeFile(scratch + "/" + kRunReportName, text);
   RemoveScratchCopy(scratch);
   if (options.verbosity != Verbosity::kQuiet && !text.empty()) {
     printf("Preview of the migration into %s (nothing there was changed):\n",
            options.destination.c_str());
-    PrintReport(text, ReportParts::kSummaryAndConflicts, stdout);
+    PrintReport(text, options.verbosity == Verbosity::kVerbose ? ReportParts::kWhole
+                                                                : ReportParts::kSummaryAndConflicts,
+                stdout);
   }
   return status;
 }

@@ -163,8 +163,11 @@ HostOptions ReadHostOptions(int argc, char** argv) {
     if (!options.missingRunOptions.empty()) options.missingRunOptions += ", ";
     options.missingRunOptions += std::string("-") + name;
   }
-  if (options.action == HostAction::kPreview && options.destinationArgument == 0) {
-    options.error = std::string("vxmigrate: a preview (-n) needs the destination on the command line, as -D2:<folder>\n") + kHostHint;
+  // An incomplete line would have the command file fill it in, and the file's destination would
+  // replace the scratch copy's: the preview would write into a real installation.
+  if (options.action == HostAction::kPreview && !options.missingRunOptions.empty()) {
+    options.error = "vxmigrate: a preview (-n) needs the whole run on the command line; missing " +
+                    options.missingRunOptions + "\n" + kHostHint;
     options.action = HostAction::kUsageError;
   }
   return options;

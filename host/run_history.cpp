@@ -21,18 +21,6 @@
 
 namespace {
 
-std::string ReadText(const std::string& path, bool& ok) {
-  std::string text;
-  FILE* file = fopen(path.c_str(), "rb");
-  ok = file != nullptr;
-  if (!ok) return text;
-  char buffer[65536];
-  for (size_t n; (n = fread(buffer, 1, sizeof buffer, file)) > 0;) text.append(buffer, n);
-  ok = !ferror(file);
-  fclose(file);
-  return text;
-}
-
 std::string RealPath(const std::string& path) {
   char* real = realpath(path.c_str(), nullptr);
   std::string text = real != nullptr ? real : path;
@@ -41,6 +29,17 @@ std::string RealPath(const std::string& path) {
 }
 
 }  // namespace
+
+bool ReadWholeFile(const std::string& path, std::string& text) {
+  text.clear();
+  FILE* file = fopen(path.c_str(), "rb");
+  if (file == nullptr) return false;
+  char buffer[65536];
+  for (size_t n; (n = fread(buffer, 1, sizeof buffer, file)) > 0;) text.append(buffer, n);
+  const bool ok = !ferror(file);
+  fclose(file);
+  return ok;
+}
 
 int LockDestination(vxFolderLock& lock, const std::string& destination) {
   switch (lock.Acquire(vxStringBase(destination.c_str()))) {
@@ -60,9 +59,8 @@ int LockDestination(vxFolderLock& lock, const std::string& destination) {
 
 int ShowLastReport(const std::string& destination) {
   const std::string path = destination + "/" + kRunReportName;
-  bool ok = false;
-  const std::string text = ReadText(path, ok);
-  if (!ok) {
+  std::string text;
+  if (!ReadWholeFile(path, text)) {
     fprintf(stderr, "vxmigrate: no report of a run in %s (%s)\n", destination.c_str(), strerror(errno));
     return kExitRefused;
   }

@@ -21,30 +21,42 @@ bool IsNotice(const std::string& entry) {
 }  // namespace
 
 TerminalReport::TerminalReport(Verbosity verbosity, FILE* out, FILE* err)
-    : verbosity_(verbosity), out_(out), err_(err) {}
+    : verbosity_(verbosity), out_(out), err_(err), progress_(err) {}
+
+void TerminalReport::ShowProgress(vxMigrationManager& manager) {
+  if (verbosity_ == Verbosity::kQuiet) return;
+  manager_ = &manager;
+  progress_.Enable(manager.GetSourceDirectory().str());
+}
 
 void TerminalReport::OnLogEntry(const std::string& entry) {
   if (IsError(entry) || (IsNotice(entry) && verbosity_ != Verbosity::kQuiet)) {
+    progress_.Clear();
     fprintf(err_, "%s\n", entry.c_str());
     fflush(err_);
   } else if (verbosity_ == Verbosity::kVerbose) {
+    progress_.Clear();  // standard output may be the same terminal
     // The header's blank entry stays blank.
     fprintf(out_, "%s\n", entry.find_first_not_of("\r\n") == std::string::npos ? "" : entry.c_str());
     fflush(out_);
   }
+  if (manager_ != nullptr) progress_.Update(entry, manager_->GetFilesWritten());
 }
 
 void TerminalReport::OnUnloggedFailure(const std::string& text) {
+  progress_.Clear();
   fprintf(err_, "%s\n", text.c_str());
   fflush(err_);
 }
 
 void TerminalReport::HostError(const std::string& text) {
+  progress_.Clear();
   fprintf(err_, "vxmigrate: %s\n", text.c_str());
   fflush(err_);
 }
 
 void TerminalReport::PrintSummary(vxMigrationManager& manager, int result, int logWriteError) {
+  progress_.Clear();
   if (verbosity_ == Verbosity::kQuiet) return;
   const vxPluginSearch& search = manager.GetPluginSearch();
   const vxRunCounts& counts = manager.GetRunCounts();

@@ -1,6 +1,7 @@
 // What the user sees of a run on the terminal: errors and notices that need manual action on
 // standard error as they are logged (the log's text unchanged), every entry on standard output
-// with -v, and one summary on standard output at the end. With -q only errors are printed.
+// with -v, and one summary on standard output at the end. With -q only errors are printed. On a
+// terminal (and without -q) a progress line on standard error follows the run.
 
 #ifndef VXMIGRATE_HOST_TERMINAL_REPORT_H_
 #define VXMIGRATE_HOST_TERMINAL_REPORT_H_
@@ -9,6 +10,7 @@
 #include <string>
 
 #include "host/options.h"
+#include "host/progress_line.h"
 #include "migrate/manager.h"
 
 class TerminalReport : public vxRunListener {
@@ -18,6 +20,9 @@ class TerminalReport : public vxRunListener {
 
   TerminalReport(const TerminalReport&) = delete;
   TerminalReport& operator=(const TerminalReport&) = delete;
+
+  // Shows the progress line for manager's run when standard error is a terminal, unless -q.
+  void ShowProgress(vxMigrationManager& manager);
 
   void OnLogEntry(const std::string& entry) override;
   void OnUnloggedFailure(const std::string& text) override;
@@ -34,6 +39,8 @@ class TerminalReport : public vxRunListener {
   Verbosity verbosity_;
   FILE* out_;
   FILE* err_;
+  ProgressLine progress_;
+  const vxMigrationManager* manager_ = nullptr;  // the run the progress line follows
 };
 
 #endif  // VXMIGRATE_HOST_TERMINAL_REPORT_H_

@@ -216,6 +216,10 @@ std::string vxMigrationManager::GetReportPath() const {
   return path.str();
 }
 
+long vxMigrationManager::GetFilesWritten() const {
+  return m_record == nullptr ? 0 : m_record->FilesWritten();
+}
+
 std::string vxMigrationManager::GetRunId() const {
   return m_record != nullptr && m_record->Journal() != nullptr ? m_record->Journal()->Id() : "";
 }

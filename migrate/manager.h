@@ -94,6 +94,9 @@ class VXM_EXPORT vxMigrationManager {
   // at once, then each entry as it is logged; it is not owned and must outlive the run.
   void SetRunListener(vxRunListener* listener);
   const vxRunCounts& GetRunCounts() const { return m_counts; }
+  // Destination files the run has written so far (its log and report left out); 0 when the run
+  // keeps neither report nor journal.
+  long GetFilesWritten() const;
   const vxPluginSearch& GetPluginSearch() const { return m_pluginSearch; }
   // The observer for one INI merge of source into destination, for the run's report; null when
   // the run keeps no report.

@@ -18,6 +18,7 @@
 #include <vector>
 
 #include "crypt/protected_value.h"
+#include "foundation/files/path_text.h"
 #include "foundation/string/json_text.h"
 
 namespace {
@@ -25,21 +26,14 @@ namespace {
 const char kLogName[] = "vxmigrate.log";
 
 std::string RealFolder(const std::string& folder) {
-  char* real = realpath(folder.c_str(), nullptr);
-  std::string text = real != nullptr ? real : "";
-  free(real);
-  return text;
+  std::string real;
+  return vxfiles::RealPath(folder, real) ? real : "";
 }
 
-// The real path of path's folder joined with its last part ("" when the folder cannot be found).
+// The real path of path's folder joined with its last part ("" when it cannot be found).
 std::string RealEntry(std::string_view path) {
-  std::string text(path);
-  while (text.size() > 1 && text.back() == '/') text.pop_back();
-  size_t slash = text.rfind('/');
-  if (slash == std::string::npos) return "";
-  std::string folder = RealFolder(slash == 0 ? "/" : text.substr(0, slash));
-  if (folder.empty()) return "";
-  return (folder == "/" ? "" : folder) + text.substr(slash);
+  std::string real;
+  return vxfiles::RealEntryPath(path, real) ? real : "";
 }
 
 bool Below(const std::string& path, const std::string& folder, std::string& relative) {
@@ -284,6 +278,10 @@ std::string vxRunRecord::Action(const std::string& relative, const FileRecord& f
   }
   if (file.converted) return "converted";
   return file.merged || mergedNamed_.count(relative) != 0 ? "merged" : "replaced";
+}
+
+long vxRunRecord::FilesWritten() const {
+  return static_cast<long>(files_.size() - files_.count(kLogName) - files_.count(kRunReportName));
 }
 
 std::string vxRunRecord::ReportText(const std::string& plugin) {

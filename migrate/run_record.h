@@ -47,6 +47,9 @@ class vxRunRecord : public vxWriteObserver {
   // An observer for one INI merge of source into destination; owned by the record.
   vxIniMergeObserver* Merge(const std::string& source, const std::string& destination);
 
+  // Destination files met so far (written, or found in place by a copy), log and report left out.
+  long FilesWritten() const;
+
   // The report as JSON text; plugin is the plug-in that ran (empty when none).
   std::string ReportText(const std::string& plugin);
 

@@ -14,30 +14,15 @@
 #include <vector>
 
 #include "foundation/files/file_manager.h"
+#include "foundation/files/path_text.h"
 #include "foundation/files/temp_file.h"
 
 namespace {
 
-vxRunDoors* g_current = nullptr;
+using vxfiles::AbsoluteText;
+using vxfiles::RealPath;
 
-// An absolute text for path, with runs of separators collapsed and the closing ones dropped; ".."
-// and links are left for the kernel to resolve. Relative paths start at the current folder.
-std::string AbsoluteText(std::string_view path) {
-  std::string text;
-  if (path.empty()) return text;
-  if (path[0] != '/') {
-    char* cwd = getcwd(nullptr, 0);
-    if (cwd != nullptr) text = cwd;
-    free(cwd);
-  }
-  text.push_back('/');
-  for (char c : path) {
-    if (c == '/' && text.back() == '/') continue;
-    text.push_back(c);
-  }
-  while (text.size() > 1 && text.back() == '/') text.pop_back();
-  return text;
-}
+vxRunDoors* g_current = nullptr;
 
 // The folder that holds path ("/a/b" -> "/a", "/a" -> "/"); path is absolute.
 std::string ParentOf(const std::string& path) {
@@ -48,14 +33,6 @@ std::string ParentOf(const std::string& path) {
 std::string LastPart(const std::string& path) {
   size_t slash = path.rfind('/');
   return slash == std::string::npos ? path : path.substr(slash + 1);
-}
-
-bool RealPath(const std::string& path, std::string& real) {
-  char* resolved = realpath(path.c_str(), nullptr);
-  if (resolved == nullptr) return false;
-  real = resolved;
-  free(resolved);
-  return true;
 }
 
 // The real path of an absolute folder, where folders at its end that do not exist yet count as

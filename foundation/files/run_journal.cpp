@@ -24,6 +24,7 @@
 #include <vector>
 
 #include "foundation/files/dir_entries.h"
+#include "foundation/files/path_text.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/write_all.h"
 
@@ -44,44 +45,6 @@ int NextRunNumber(const std::string& runs) {
   close(fd);
   for (const vxfiles::DirEntry& entry : entries) highest = std::max(highest, atoi(entry.name.c_str()));
   return highest + 1;
-}
-
-// The absolute text of path with repeated and closing separators dropped.
-std::string AbsolutePath(std::string_view path) {
-  std::string text;
-  if (path.empty() || path[0] != '/') {
-    char* cwd = getcwd(nullptr, 0);
-    if (cwd != nullptr) text = cwd;
-    free(cwd);
-  }
-  text.push_back('/');
-  for (char c : path) {
-    if (c == '/' && text.back() == '/') continue;
-    text.push_back(c);
-  }
-  while (text.size() > 1 && text.back() == '/') text.pop_back();
-  return text;
-}
-
-// The real path of path's folder joined with its last part; folders not made yet are kept as
-// written below the last one that exists.
-bool RealEntryPath(const std::string& path, std::string& real) {
-  std::string folder = path, rest;
-  for (;;) {
-    size_t slash = folder.rfind('/');
-    if (slash == std::string::npos) return false;
-    std::string last = folder.substr(slash + 1);
-    if (last == "." || last == "..") return false;
-    rest = rest.empty() ? last : last + "/" + rest;
-    folder = slash == 0 ? "/" : folder.substr(0, slash);
-    char* resolved = realpath(folder.c_str(), nullptr);
-    if (resolved != nullptr) {
-      real = Join(resolved, rest);
-      free(resolved);
-      return true;
-    }
-    if (errno != ENOENT || folder == "/") return false;
-  }
 }
 
 // A copy of the regular file from as to, with its mode: a reflink when the file system can, the
@@ -186,7 +149,7 @@ bool vxRunJournal::Append(const std::string& record) {
 
 bool vxRunJournal::Relative(const std::string& absolute, std::string& relative) const {
   std::string real;
-  if (!RealEntryPath(absolute, real)) return false;
+  if (!vxfiles::RealEntryPath(absolute, real)) return false;
   if (real.compare(0, destination_.size(), destination_) != 0 ||
       real.size() <= destination_.size() + 1 || real[destination_.size()] != '/') {
     return false;
@@ -242,24 +205,14 @@ bool vxRunJournal::KeepOld(const std::string& relative, const std::string& path,
 bool vxRunJournal::BeforeEntry(std::string_view path, bool inPlace) {
   if (fd_ < 0) return false;
   std::string relative;
-  const std::string absolute = AbsolutePath(path);
-  if (!Relative(absolute, relative)) return true;  // the destination folder itself: no entry
+  if (!Relative(vxfiles::AbsoluteText(path), relative)) return true;  // the destination folder itself: no entry
   return KeepOld(relative, Join(destination_, relative), inPlace);
-}
-
-bool vxRunJournal::BeforeEntryAt(int dirFd, const char* name) {
-  char link[64];
-  snprintf(link, sizeof link, "/proc/self/fd/%d", dirFd);
-  std::vector<char> folder(4096);
-  ssize_t n = readlink(link, folder.data(), folder.size());
-  if (n <= 0 || static_cast<size_t>(n) >= folder.size()) return false;
-  return BeforeEntry(Join(std::string(folder.data(), static_cast<size_t>(n)), name), false);
 }
 
 bool vxRunJournal::BeforeFolder(std::string_view folder) {
   if (fd_ < 0) return false;
   std::string relative;
-  if (!Relative(AbsolutePath(folder), relative)) return true;
+  if (!Relative(vxfiles::AbsoluteText(folder), relative)) return true;
   // The missing folders, outermost first.
   std::vector<std::string> missing;
   for (std::string walk = relative;;) {

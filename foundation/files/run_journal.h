@@ -42,8 +42,6 @@ class vxRunJournal {
   bool BeforeEntry(std::string_view path, bool inPlace);
   // Lists the folders on the way to folder that do not exist yet: the run is about to make them.
   bool BeforeFolder(std::string_view folder);
-  // As BeforeEntry for the entry name of the folder open at dirFd.
-  bool BeforeEntryAt(int dirFd, const char* name);
 
   // Closes the journal: the state of every entry the run wrote, so that undo can tell a file
   // changed afterwards, and the run's result.

@@ -38,6 +38,10 @@ TEST(HostCommandLine, EachCaseHasItsStatusAndTextsAndRefusalsWriteNothing) {
       {{"-D1:"}, 2, "", "~vxmigrate: '-D1:': needs a folder, as -D1:<folder>\n"},
       {{"-D2"}, 2, "", "~vxmigrate: '-D2': needs a folder, as -D2:<folder>\n"},
       {{"-FT:maybe"}, 2, "", "~accepted values: Y, Yes, N, No\n"},
+      // A command file would fill the line in and its destination would replace the scratch copy.
+      {{"-", "-n", "-D2:/x", "-cmd:/x"}, 2, "",
+       "~vxmigrate: a preview (-n) needs the whole run on the command line; missing -D1, -P1, "
+       "-P2, -V1, -V2\n"},
       {{"-", "-D1:/a", "-P1:pavsuite"}, 2, "",
        std::string("vxmigrate: incomplete run: missing -D2, -P2, -V1, -V2, and no usable "
                    "migcmd.ini gives it\n") + kHint},

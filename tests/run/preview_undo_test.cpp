@@ -3,6 +3,7 @@
 // exact tree from before a run, also after a run killed midway; the report shows a planted
 // conflict with both values and never a protected value in clear.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/stat.h>
@@ -12,7 +13,9 @@
 #include <algorithm>
 #include <string>
 
+#include "migrate/installations_fixture.h"
 #include "run/host_run.h"
+#include "run/sample_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -66,26 +69,55 @@ TEST(Preview, LeavesTheDestinationAsItWasAndReportsWhatTheRunThenDoes) {
   EXPECT_NE(std::string::npos, preview.find(real.substr(real.rfind("Files: ")))) << real;
 }
 
+// Lines added right after a section's header line, ending as that line ends (the Halden sample's
+// settings end their lines in "\r\n").
+std::string WithLinesAfter(const std::string& text, const std::string& header, const Lines& lines) {
+  const size_t at = text.find(header);
+  const size_t end = at == std::string::npos ? at : text.find('\n', at);
+  if (end == std::string::npos) {
+    ADD_FAILURE() << header << " not found";
+    return text;
+  }
+  const std::string lineEnd = text[end - 1] == '\r' ? "\r\n" : "\n";
+  std::string added;
+  for (const std::string& line : lines) added += line + lineEnd;
+  return text.substr(0, end + 1) + added + text.substr(end + 1);
+}
+
+// Protected values from the source reach the merge as added keys and as conflicts, under names
+// that do not say "password": the report must know them by their form.
 TEST(Report, NamesConflictsWithBothValuesAndMasksProtectedOnes) {
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   PlantConflict(run);
+  const std::string sourceAccount = Protected("stats-account"), sourceRelay = Protected("relay-user"),
+                    keptRelay = Protected("kept-user");
+  const std::string obx = run.dst + "/vxm_vxx/vxm_vxx.ini";
+  WriteFile(obx, WithLinesAfter(ReadFile(obx), "[Mail]", {"RelayUser=" + keptRelay}));
   const std::string halden = run.src + "/vxm_log/vxm_log.ini";
-  std::string settings = ReadFile(halden);
-  settings.insert(settings.find("[Mail]\n") + 7,
-                  "SmtpPassword=D9369CD16883E81D88BA98FB93B0DB4F7DAB\n"
-                  "Account=D94F4859206C3067E5EF5549BC4C8E82D9AB\n");
-  WriteFile(halden, settings);
+  WriteFile(halden, WithLinesAfter(ReadFile(halden), "[Mail]",
+                                   {"SmtpPassword=" + Protected("source-secret"),
+                                    "Account=" + sourceAccount, "RelayUser=" + sourceRelay}));
   ASSERT_EQ(0, run.Run(run.SampleOptions()));
   const std::string report = ReadFile(run.dst + "/vxmigrate-report.json");
-  EXPECT_NE(std::string::npos,
-            report.find("{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": "
-                        "\"mail.example.com\", \"kept\": \"relay.internal\"}")) << report;
-  for (const char* secret : {"D94F4859206C3067E5EF5549BC4C8E82D9AB", "D9369CD16883E81D88BA98FB93B0DB4F7DAB"}) {
-    EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
+  for (const char* expected :
+       {"{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": \"mail.example.com\", "
+        "\"kept\": \"relay.internal\"}",
+        "{\"section\": \"Mail\", \"key\": \"Account\", \"value\": \"<protected>\"}",
+        "{\"section\": \"Mail\", \"key\": \"RelayUser\", \"source\": \"<protected>\", "
+        "\"kept\": \"<protected>\"}",
+        "{\"section\": \"Mail\", \"key\": \"SmtpPassword\", \"source\": \"<protected>\", "
+        "\"kept\": \"<protected>\"}",
+        "{\"path\": \"vxm_vxx/vxm_vxx.ini\", \"action\": \"merged\", "
+        "\"source\": \"vxm_log/vxm_log.ini\"}"}) {
+    EXPECT_NE(std::string::npos, report.find(expected)) << expected << "\n" << report;
   }
-  EXPECT_NE(std::string::npos, report.find("{\"path\": \"vxm_vxx/vxm_vxx.ini\", \"action\": \"merged\", "
-                                           "\"source\": \"vxm_log/vxm_log.ini\"}"));
+  ASSERT_EQ(0, run.Run({"--report", run.dst}));
+  for (const std::string& secret : {sourceAccount, sourceRelay, keptRelay, Protected("source-secret"),
+                                    std::string("D94F4859206C3067E5EF5549BC4C8E82D9AB")}) {
+    EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
+    EXPECT_EQ(std::string::npos, run.Out().find(secret)) << secret;
+  }
 }
 
 TEST(Undo, GivesBackTheExactTreeAndKeepsTheUndoneLog) {
@@ -119,42 +151,96 @@ TEST(Undo, RefusesNamingFilesChangedSinceTheRunUnlessForced) {
   EXPECT_EQ(before, Installation(run.dst, false));
 }
 
+// Starts the host with args (args[0] its path) in folder, its output thrown away; and kills it
+// once the journal holds records lines, unless it ended first (then the run is undone whole).
+void KillWhenJournalHas(const std::string& folder, Lines args, const std::string& journal,
+                        int records) {
+  pid_t child = fork();
+  if (child == 0) {
+    std::vector<char*> argv;
+    for (std::string& arg : args) argv.push_back(arg.data());
+    argv.push_back(nullptr);
+    int null = open("/dev/null", O_WRONLY);
+    if (null < 0 || dup2(null, 1) < 0 || dup2(null, 2) < 0 || chdir(folder.c_str()) != 0) _exit(126);
+    execv(argv[0], argv.data());
+    _exit(127);
+  }
+  ASSERT_GT(child, 0);
+  // Polled for up to a minute (a loaded machine starts the host slowly).
+  int status = 0;
+  for (int i = 0; i < 60000; ++i) {
+    const std::string text = ReadFile(journal);
+    if (std::count(text.begin(), text.end(), '\n') >= records) break;
+    if (waitpid(child, &status, WNOHANG) == child) return;
+    usleep(1000);
+  }
+  kill(child, SIGKILL);
+  waitpid(child, &status, 0);
+}
+
 // Killed at whatever point its journal has reached a few changes: undo still gives the tree back.
 TEST(Undo, TakesBackARunKilledMidway) {
   for (int changes : {2, 5, 9}) {
     HostRun run({"halden_to_obx"});
     run.UseSamples();
     const auto before = Installation(run.dst, false);
-    pid_t child = fork();
-    if (child == 0) {
-      std::vector<std::string> args = {run.bin + "/vxmigrate"};
-      for (const std::string& option : run.SampleOptions()) args.push_back(option);
-      args.push_back("-q");
-      std::vector<char*> argv;
-      for (std::string& arg : args) argv.push_back(arg.data());
-      argv.push_back(nullptr);
-      execv(argv[0], argv.data());
-      _exit(127);
-    }
-    const std::string journal = run.dst + "/.vxmigrate/runs/000001/journal";
-    // Polled for up to a minute (a loaded machine starts the host slowly); a run that ends first
-    // is undone as a whole.
-    int status = 0;
-    bool ended = false;
-    for (int i = 0; i < 60000 && !ended; ++i) {
-      const std::string text = ReadFile(journal);
-      if (std::count(text.begin(), text.end(), '\n') >= changes + 2) break;
-      ended = waitpid(child, &status, WNOHANG) == child;
-      usleep(1000);
-    }
-    if (!ended) {
-      kill(child, SIGKILL);
-      waitpid(child, &status, 0);
-    }
+    Lines args = {run.bin + "/vxmigrate"};
+    for (const std::string& option : run.SampleOptions()) args.push_back(option);
+    KillWhenJournalHas(run.Path(""), args, run.dst + "/.vxmigrate/runs/000001/journal", changes + 2);
     ASSERT_EQ(0, run.Run({"--undo", run.dst})) << changes << run.Err();
     EXPECT_EQ(before, Installation(run.dst, false)) << changes;
   }
 }
+
+// Each shipped plug-in on copies of its samples, started with its command file's run as a whole
+// command line.
+class EveryShippedPlugin : public ::testing::TestWithParam<const char*> {};
+
+TEST_P(EveryShippedPlugin, PreviewLeavesTheDestinationAsItWasAndReportsWhatTheRunDoes) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, true);
+  Lines preview = run.RunOptions();
+  preview.insert(preview.end(), {"-n", "-v"});  // -v: the whole report, as --report shows it
+  ASSERT_EQ(0, run.Run(preview)) << run.Err();
+  EXPECT_EQ(before, Installation(dst, true));
+  const std::string title =
+      "Preview of the migration into " + run.destination + " (nothing there was changed):\n";
+  const size_t at = run.Out().find(title);
+  ASSERT_NE(std::string::npos, at) << run.Out();
+  const std::string previewed = run.Out().substr(at + title.size());
+  for (const std::string& name : ListTree(run.Path(""))) {
+    EXPECT_EQ(std::string::npos, name.find("vxpreview")) << name;
+  }
+
+  ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
+  ASSERT_EQ(0, run.Run({"--report", run.destination})) << run.Err();
+  EXPECT_EQ(run.Out(), previewed);
+  EXPECT_NE(std::string::npos, previewed.find("Files:\n  ")) << previewed;
+}
+
+TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeTheRun) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, false);
+  ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
+  ASSERT_NE(before, Installation(dst, false));
+  ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
+  EXPECT_EQ(before, Installation(dst, false));
+}
+
+TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeARunKilledMidway) {
+  SampleRun run(GetParam());
+  const std::string dst = run.Path(run.destination);
+  const auto before = Installation(dst, false);
+  Lines args = {run.Path("bin/vxmigrate")};
+  for (const std::string& option : run.RunOptions()) args.push_back(option);
+  KillWhenJournalHas(run.Path(""), args, dst + "/.vxmigrate/runs/000001/journal", 6);
+  ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
+  EXPECT_EQ(before, Installation(dst, false));
+}
+
+INSTANTIATE_TEST_SUITE_P(Samples, EveryShippedPlugin, ::testing::ValuesIn(kShippedPlugins));
 
 }  // namespace
 }  // namespace vxtest

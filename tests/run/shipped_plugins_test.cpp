@@ -16,95 +16,13 @@
 #include <string>
 #include <vector>
 
+#include "run/sample_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
 namespace {
 
 namespace fs = std::filesystem;
-using Tree = std::map<std::string, std::string>;
-
-const char* const kShippedPlugins[] = {"halden_to_obx", "halsuite_to_halsuite", "log_to_log",
-                                       "obx_to_obx"};
-
-std::string Source(const std::string& relative) {
-  return std::string(VXM_SOURCE_DIR) + "/" + relative;
-}
-
-// Every file below folder by relative name, with its content.
-// The run's own bookkeeping (its undo journal and report) is no installation file and is left out.
-Tree FilesBelow(const std::string& folder) {
-  Tree files;
-  for (const std::string& name : ListTree(folder)) {
-    if (name.rfind(".vxmigrate", 0) == 0 || name == "vxmigrate-report.json") continue;
-    if (!fs::is_directory(folder + "/" + name)) files[name] = ReadFile(folder + "/" + name);
-  }
-  return files;
-}
-
-// The value of key in the sample command file's "main" section ("D1=halden" -> "halden").
-std::string MainValue(const std::string& commandFile, const std::string& key) {
-  std::ifstream in(commandFile);
-  for (std::string line; std::getline(in, line);) {
-    if (line.rfind(key + "=", 0) == 0) return line.substr(key.size() + 1);
-  }
-  return "";
-}
-
-// One run folder: a bin folder with the host, its library, "vxmigrate.ini" and every shipped
-// plug-in, copies of the plug-in's two sample installations and its command file.
-class SampleRun {
-  TempDir root_;
-
- public:
-  const std::string plugin, commandFile, source, destination;
-
-  explicit SampleRun(const std::string& name)
-      : plugin(name),
-        commandFile(Source("samples/runs/" + name + "/migcmd.ini")),
-        source(MainValue(commandFile, "D1")),
-        destination(MainValue(commandFile, "D2")) {
-    const std::string host = VXM_HOST_EXE, built = host.substr(0, host.rfind('/'));
-    Install(host, "vxmigrate");
-    Install(built + "/libvxmigrate.so.0", "libvxmigrate.so.0");
-    for (const char* shipped : kShippedPlugins) Install(built + "/" + shipped + ".so", "");
-    Install(Source("host/vxmigrate.ini"), "");
-    fs::copy(Source("samples/" + source), Path(source), fs::copy_options::recursive);
-    fs::copy(Source("samples/" + destination), Path(destination), fs::copy_options::recursive);
-    fs::copy_file(commandFile, Path("migcmd.ini"));
-  }
-
-  std::string Path(const std::string& relative) const { return root_.Path(relative); }
-
-  // The host's exit status, run from the run folder as a user would.
-  int Run() const {
-    const std::string command = "cd '" + root_.path() + "' && bin/vxmigrate -cmd:./migcmd.ini >" +
-                                Path("out.txt") + " 2>&1";
-    const int status = system(command.c_str());
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-  }
-
-  // The destination's files, its log without time stamps and with the run folder as "<run>".
-  Tree Destination() const {
-    Tree files = FilesBelow(Path(destination));
-    std::string log;
-    for (std::string entry : LogEntries(Path(destination + "/vxmigrate.log"))) {
-      for (size_t at; (at = entry.find(root_.path())) != std::string::npos;) {
-        entry.replace(at, root_.path().size(), "<run>");
-      }
-      log += entry + "\n";
-    }
-    files["vxmigrate.log"] = log;
-    return files;
-  }
-
- private:
-  void Install(const std::string& from, std::string name) const {
-    if (name.empty()) name = from.substr(from.rfind('/') + 1);
-    WriteFile(Path("bin/" + name), ReadFile(from));
-    chmod(Path("bin/" + name).c_str(), 0755);
-  }
-};
 
 std::string GoldenFolder(const std::string& plugin) {
   return Source("tests/run/golden/" + plugin);
