@@ -30,12 +30,6 @@ std::string RealFolder(const std::string& folder) {
   return vxfiles::RealPath(folder, real) ? real : "";
 }
 
-// The real path of path's folder joined with its last part ("" when it cannot be found).
-std::string RealEntry(std::string_view path) {
-  std::string real;
-  return vxfiles::RealEntryPath(path, real) ? real : "";
-}
-
 bool Below(const std::string& path, const std::string& folder, std::string& relative) {
   if (folder.empty() || path.size() <= folder.size() + 1 ||
       path.compare(0, folder.size(), folder) != 0 || path[folder.size()] != '/') {
@@ -157,6 +151,11 @@ vxRunRecord::vxRunRecord(const std::string& source, const std::string& destinati
 }
 
 vxRunRecord::~vxRunRecord() = default;
+
+std::string vxRunRecord::RealEntry(std::string_view path) const {
+  std::string real;
+  return realPaths_.Entry(path, real) ? real : "";
+}
 
 bool vxRunRecord::DestinationRelative(std::string_view path, std::string& relative) const {
   return Below(RealEntry(path), destinationReal_, relative);

@@ -68,10 +68,12 @@ class vxRunRecord : public vxWriteObserver {
 
   FileRecord& Touch(const std::string& relative);
   bool DestinationRelative(std::string_view path, std::string& relative) const;
+  std::string RealEntry(std::string_view path) const;  // "" when it cannot be found
   std::string Shown(const std::string& text) const;
   std::string Action(const std::string& relative, const FileRecord& file) const;
 
   std::string sourceReal_, destinationReal_, destinationText_, shownDestination_;
+  mutable vxRealPaths realPaths_;  // a cache: asking for a real path changes nothing
   std::unique_ptr<vxRunJournal> journal_;
   std::map<std::string, FileRecord> files_;  // by path relative to the destination
   std::vector<std::unique_ptr<MergeRecord>> merges_;

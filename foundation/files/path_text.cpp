@@ -33,8 +33,21 @@ bool RealPath(const std::string& path, std::string& real) {
   return true;
 }
 
-bool RealEntryPath(std::string_view path, std::string& real) {
-  std::string folder = AbsoluteText(path), rest;
+}  // namespace vxfiles
+
+bool vxRealPaths::Folder(const std::string& folder, std::string& real) {
+  auto known = folders_.find(folder);
+  if (known != folders_.end()) {
+    real = known->second;
+    return true;
+  }
+  if (!vxfiles::RealPath(folder, real)) return false;
+  folders_.emplace(folder, real);
+  return true;
+}
+
+bool vxRealPaths::Entry(std::string_view path, std::string& real) {
+  std::string folder = vxfiles::AbsoluteText(path), rest;
   for (;;) {
     const size_t slash = folder.rfind('/');
     if (slash == std::string::npos) return false;
@@ -43,12 +56,10 @@ bool RealEntryPath(std::string_view path, std::string& real) {
     rest = rest.empty() ? last : last + "/" + rest;
     folder = slash == 0 ? "/" : folder.substr(0, slash);
     std::string resolved;
-    if (RealPath(folder, resolved)) {
+    if (Folder(folder, resolved)) {
       real = resolved == "/" ? "/" + rest : resolved + "/" + rest;
       return true;
     }
     if (errno != ENOENT || folder == "/") return false;
   }
 }
-
-}  // namespace vxfiles

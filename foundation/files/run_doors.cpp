@@ -128,7 +128,7 @@ bool vxRunDoors::AdmitWriteBelow(const std::string& folder, std::string_view pat
     return false;
   }
   std::string real;
-  if (!RealFolder(folder, real) && !ResolveFolder(folder, real)) {
+  if (!realPaths_.Folder(folder, real) && !ResolveFolder(folder, real)) {
     Refuse("Error: Refused to write where the path cannot be followed: ", path);
     return false;
   }
@@ -183,19 +183,6 @@ bool vxRunDoors::IsInstallationText(const std::string& path) const {
   return false;
 }
 
-// The real path of an existing folder, remembered by its text: a run asks about thousands of
-// files in a few folders, and resolving a path asks the kernel once per part of it.
-bool vxRunDoors::RealFolder(const std::string& folder, std::string& real) {
-  auto known = realFolders_.find(folder);
-  if (known != realFolders_.end()) {
-    real = known->second;
-    return true;
-  }
-  if (!RealPath(folder, real)) return false;
-  realFolders_.emplace(folder, real);
-  return true;
-}
-
 bool vxRunDoors::AdmitRead(std::string_view path) {
   const std::string text = AbsoluteText(path);
   if (!IsInstallationText(text)) return true;
@@ -204,7 +191,7 @@ bool vxRunDoors::AdmitRead(std::string_view path) {
   std::string real;
   if (!S_ISLNK(entry.st_mode) && !S_ISDIR(entry.st_mode) && text != "/") {
     // A file that is no link lies in its folder: that folder decides.
-    if (!RealFolder(ParentOf(text), real) || Locate(real) != Within::kNeither) return true;
+    if (!realPaths_.Folder(ParentOf(text), real) || Locate(real) != Within::kNeither) return true;
     Refuse("Error: Refused to read a file that leads outside the installations: ", path);
     return false;
   }

@@ -17,6 +17,7 @@
 #include <unordered_set>
 
 #include "foundation/export.h"
+#include "foundation/files/path_text.h"
 #include "foundation/string/string_base.h"
 
 // Told of each change the doors admitted, before it is made, and of each installation read. The
@@ -94,7 +95,6 @@ class VXM_EXPORT vxRunDoors {
   bool IsInstallationText(const std::string& path) const;
   void Refuse(const char* text, std::string_view path) const;
   void SweepOnce(const std::string& realFolder);
-  bool RealFolder(const std::string& folder, std::string& real);
 
   Reporter reporter_;
   std::string sourceText_;
@@ -107,7 +107,7 @@ class VXM_EXPORT vxRunDoors {
   bool destinationInsideSource_ = false;
   std::unordered_map<std::string, Within> located_;  // real folder -> first installation above it
   std::unordered_set<std::string> swept_;            // destination folders cleared of stale temps
-  std::unordered_map<std::string, std::string> realFolders_;  // folder text -> its real path
+  vxRealPaths realPaths_;
   vxRunDoors* previous_ = nullptr;
   vxWriteObserver* observer_ = nullptr;
 };

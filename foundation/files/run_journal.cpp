@@ -147,9 +147,9 @@ bool vxRunJournal::Append(const std::string& record) {
   return fd_ >= 0 && vxWriteAll(fd_, line.data(), line.size());
 }
 
-bool vxRunJournal::Relative(const std::string& absolute, std::string& relative) const {
+bool vxRunJournal::Relative(const std::string& absolute, std::string& relative) {
   std::string real;
-  if (!vxfiles::RealEntryPath(absolute, real)) return false;
+  if (!realPaths_.Entry(absolute, real)) return false;
   if (real.compare(0, destination_.size(), destination_) != 0 ||
       real.size() <= destination_.size() + 1 || real[destination_.size()] != '/') {
     return false;

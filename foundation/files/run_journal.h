@@ -15,6 +15,8 @@
 #include <unordered_set>
 #include <vector>
 
+#include "foundation/files/path_text.h"
+
 // Names inside a destination's history folder (dir_entries.h names the folder itself).
 constexpr char kRunJournalRuns[] = "runs";
 constexpr char kRunJournalFile[] = "journal";
@@ -55,11 +57,12 @@ class vxRunJournal {
     ino_t ino = 0;
   };
 
-  bool Relative(const std::string& absolute, std::string& relative) const;
+  bool Relative(const std::string& absolute, std::string& relative);
   bool KeepOld(const std::string& relative, const std::string& path, bool inPlace);
   bool Append(const std::string& record);
 
   std::string destination_;
+  vxRealPaths realPaths_;
   std::string folder_;
   std::string id_;
   int fd_ = -1;

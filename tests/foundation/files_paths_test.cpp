@@ -10,6 +10,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/files/filename.h"
+#include "foundation/files/path_text.h"
 #include "support/test_files.h"
 
 namespace {
@@ -116,6 +117,33 @@ TEST(FolderList, FoldersAreCreatedAndListedDepthFirstSortedWithoutFollowingLinks
   EXPECT_EQ(0, vxFileManager::DeleteFile(tmp.Path("a/file").c_str(), 0));
   EXPECT_EQ(1, vxFileManager::DeleteFile(tmp.Path("a/file").c_str(), 0));
   EXPECT_EQ(0, vxFileManager::DeleteFile(tmp.Path("a/file").c_str(), 1));  // missing is fine here
+}
+
+TEST(RealPaths, NameTheEntryItselfThroughResolvedFoldersAndKeepMissingOnesAsWritten) {
+  vxtest::TempDir tmp;
+  std::string root;
+  ASSERT_TRUE(vxfiles::RealPath(tmp.path(), root));
+  vxtest::MakeDirs(tmp.Path("real/sub"));
+  ASSERT_EQ(0, symlink("real", tmp.Path("via").c_str()));
+  ASSERT_EQ(0, symlink("/etc/passwd", tmp.Path("real/sub/out").c_str()));
+  vxRealPaths paths;
+  std::string real;
+  ASSERT_TRUE(paths.Entry(tmp.Path("via/sub/out"), real));  // the link is named, not followed
+  EXPECT_EQ(root + "/real/sub/out", real);
+  ASSERT_TRUE(paths.Entry(tmp.Path("via//sub/new/deeper/file"), real));
+  EXPECT_EQ(root + "/real/sub/new/deeper/file", real);
+  EXPECT_TRUE(paths.Entry(tmp.Path("via/sub/../sub/x"), real));  // ".." is the kernel's to resolve
+  EXPECT_EQ(root + "/real/sub/x", real);
+  EXPECT_FALSE(paths.Entry(tmp.Path("via/missing/.."), real));
+  EXPECT_FALSE(paths.Entry("", real));
+  ASSERT_EQ(0, symlink("loop", tmp.Path("loop").c_str()));
+  EXPECT_FALSE(paths.Entry(tmp.Path("loop/file"), real));
+  // Each folder is asked once: a folder seen before keeps its real path for the run.
+  ASSERT_EQ(0, rename(tmp.Path("real").c_str(), tmp.Path("moved").c_str()));
+  ASSERT_TRUE(paths.Entry(tmp.Path("via/sub/out"), real));
+  EXPECT_EQ(root + "/real/sub/out", real);
+  ASSERT_TRUE(vxRealPaths().Entry(tmp.Path("via/sub/out"), real));  // "via" now leads nowhere
+  EXPECT_EQ(root + "/via/sub/out", real);
 }
 
 }  // namespace
