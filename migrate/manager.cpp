@@ -234,7 +234,7 @@ void vxMigrationManager::FinishRun(int status) {
     vxfiles::ReplaceTarget target;
     vxfiles::AtomicFileWriter writer;
     if (!vxfiles::ResolveReplaceTarget(path, &target) || !writer.Begin(target) ||
-        !writer.Append(text) || !writer.Commit(false)) {
+        !writer.Append(text) || !writer.Commit(true)) {
       Log("Error: Unable to write file:   ", path.c_str());
     }
   }
@@ -275,6 +275,11 @@ int vxMigrationManager::DoMigration() {
   bool found = false;
   RunPlugins(found);
   RunInstallScript();
+  // A run that says it finished has its files on the disk: one sync of the destination's file
+  // system covers every file and folder the run wrote.
+  if (!vxfiles::SyncFileSystemOf(m_destinationDirectory.c_str())) {
+    Log("Error: Unable to flush the run's writes to disk: ", m_destinationDirectory.c_str());
+  }
   if (!found) {
     Log("Error: No appropriate migration libraries found.  There may not be support for the "
         "products or versions being migrated.  Check the readme file for more info.");

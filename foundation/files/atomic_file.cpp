@@ -112,4 +112,14 @@ bool AtomicFileWriter::Commit(bool flushToDisk, bool replace) {
   return ok;
 }
 
+bool SyncFileSystemOf(const std::string& folder) {
+  const int fd = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+  if (fd < 0) return false;
+  const bool synced = syncfs(fd) == 0;
+  const int error = errno;
+  close(fd);
+  errno = error;
+  return synced;
+}
+
 }  // namespace vxfiles

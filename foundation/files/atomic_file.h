@@ -31,6 +31,11 @@ bool ResolveReplaceTarget(const std::string& path, ReplaceTarget* target);
 // The permission bits a new file gets: 0666 less the process's umask.
 mode_t NewFileMode();
 
+// Makes everything written so far to the file system holding folder durable: one syncfs at the
+// end of a run instead of an fsync per file and folder. False (errno set) when the folder cannot
+// be opened or the kernel reports a lost write.
+bool SyncFileSystemOf(const std::string& folder);
+
 // Writes a new version of a file beside it and renames it into place on Commit. Destroyed
 // without a successful Commit, it removes the temporary file and the target stays as it was.
 class AtomicFileWriter {
