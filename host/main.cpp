@@ -8,6 +8,7 @@
 #include <string>
 
 #include "foundation/files/folder_lock.h"
+#include "foundation/files/whole_file.h"
 #include "host/exit_status.h"
 #include "host/options.h"
 #include "host/report_view.h"
@@ -75,7 +76,7 @@ int Preview(HostOptions& options) {
   settings.shownDestination = options.destination;
   const int status = Migrate(options, settings, true);
   std::string text;
-  ReadWholeFile(scratch + "/" + kRunReportName, text);
+  vxfiles::ReadWholeFile(scratch + "/" + kRunReportName, &text);
   RemoveScratchCopy(scratch);
   if (options.verbosity != Verbosity::kQuiet && !text.empty()) {
     printf("Preview of the migration into %s (nothing there was changed):\n",

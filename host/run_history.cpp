@@ -15,6 +15,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/files/folder_lock.h"
 #include "foundation/files/run_undo.h"
+#include "foundation/files/whole_file.h"
 #include "host/exit_status.h"
 #include "host/report_view.h"
 #include "migrate/run_record.h"
@@ -29,17 +30,6 @@ std::string RealPath(const std::string& path) {
 }
 
 }  // namespace
-
-bool ReadWholeFile(const std::string& path, std::string& text) {
-  text.clear();
-  FILE* file = fopen(path.c_str(), "rb");
-  if (file == nullptr) return false;
-  char buffer[65536];
-  for (size_t n; (n = fread(buffer, 1, sizeof buffer, file)) > 0;) text.append(buffer, n);
-  const bool ok = !ferror(file);
-  fclose(file);
-  return ok;
-}
 
 int LockDestination(vxFolderLock& lock, const std::string& destination) {
   switch (lock.Acquire(vxStringBase(destination.c_str()))) {
@@ -60,7 +50,7 @@ int LockDestination(vxFolderLock& lock, const std::string& destination) {
 int ShowLastReport(const std::string& destination) {
   const std::string path = destination + "/" + kRunReportName;
   std::string text;
-  if (!ReadWholeFile(path, text)) {
+  if (!vxfiles::ReadWholeFile(path, &text)) {
     fprintf(stderr, "vxmigrate: no report of a run in %s (%s)\n", destination.c_str(), strerror(errno));
     return kExitRefused;
   }

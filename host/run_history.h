@@ -11,9 +11,6 @@ class vxFolderLock;
 // Takes the destination's lock: 0 when held, otherwise the exit status, having said why.
 int LockDestination(vxFolderLock& lock, const std::string& destination);
 
-// The whole file at path into text; false (errno set) when it cannot be read.
-bool ReadWholeFile(const std::string& path, std::string& text);
-
 int ShowLastReport(const std::string& destination);
 int ListRuns(const std::string& destination);
 int UndoLastRun(const std::string& destination, bool force);

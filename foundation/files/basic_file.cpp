@@ -18,11 +18,10 @@
 #include "foundation/files/dir_entries.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/temp_file.h"
+#include "foundation/files/whole_file.h"
 #include "foundation/files/write_all.h"
 
 namespace {
-
-const size_t kReadChunk = 64 * 1024;
 
 // Opens the temporary file that a truncating open writes to. A symbolic link at name is replaced
 // by the new file, never written through: after a copy it may point into the source installation.
@@ -103,35 +102,14 @@ int vxBasicFile::Open() {
 int vxBasicFile::ReadAll(vxStringBase& text) {
   if (fd_ < 0) return 1;
   lseek(fd_, 0, SEEK_SET);  // the whole content, whatever was read before
-  // Sized from fstat (one byte more, to see the end in one read); a file that grows meanwhile, or
-  // a size that lies, only costs a doubling.
   struct stat st;
-  size_t expected = 0;
-  if (fstat(fd_, &st) == 0 && S_ISREG(st.st_mode) && st.st_size > 0 &&
-      static_cast<unsigned long long>(st.st_size) < (1ULL << 30)) {
-    expected = static_cast<size_t>(st.st_size);
-  }
-  try {  // a file larger than memory (or than a 32-bit address space) is refused, not thrown
-    std::string content(expected + 1 > kReadChunk ? expected + 1 : kReadChunk, '\0');
-    size_t used = 0;
-    for (;;) {
-      if (used == content.size()) {
-        if (content.size() > content.max_size() / 2) return 1;
-        content.resize(content.size() * 2);
-      }
-      ssize_t n = read(fd_, &content[used], content.size() - used);
-      if (n == 0) break;
-      if (n < 0) {
-        if (errno == EINTR) continue;
-        return 1;
-      }
-      used += static_cast<size_t>(n);
-    }
-    content.resize(used);
-    text = vxStringBase(std::string_view(content));
-  } catch (...) {
+  const bool sized = fstat(fd_, &st) == 0 && S_ISREG(st.st_mode);
+  std::string content;
+  if (!vxfiles::ReadRest(fd_, sized ? static_cast<size_t>(st.st_size) : 0, vxfiles::kMaxWholeFile,
+                         &content)) {
     return 1;
   }
+  text = vxStringBase(std::string_view(content));
   return 0;
 }
 

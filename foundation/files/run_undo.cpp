@@ -23,6 +23,7 @@
 
 #include "foundation/files/dir_entries.h"
 #include "foundation/files/run_journal.h"
+#include "foundation/files/whole_file.h"
 
 namespace {
 
@@ -58,7 +59,9 @@ std::vector<std::string> Fields(const std::string& line) {
 // Reads the journal; run (when given) gets its header and end.
 Journal ReadJournal(const std::string& folder, vxRunEntry* run) {
   Journal journal;
-  std::ifstream in(Join(folder, kRunJournalFile));
+  std::string text;
+  vxfiles::ReadWholeFile(Join(folder, kRunJournalFile), &text);  // a missing journal lists nothing
+  std::istringstream in(text);
   for (std::string line; std::getline(in, line);) {
     std::vector<std::string> f = Fields(line);
     if (f.size() < 2) continue;

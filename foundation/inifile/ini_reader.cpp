@@ -5,7 +5,7 @@
 #include <cstring>
 #include <memory>
 
-#include "foundation/inifile/ini_disk.h"
+#include "foundation/files/whole_file.h"
 #include "foundation/inifile/ini_file.h"
 #include "foundation/inifile/ini_section.h"
 
@@ -138,7 +138,7 @@ int vxMappedINIFile::Open(unsigned int flag) {
   loaded_ = false;
   try {
     auto text = std::make_shared<std::string>();
-    if (!vxini::ReadWholeFile(filename_.str(), text.get(), &loadedMode_)) return 1;
+    if (!vxfiles::ReadWholeFile(filename_.str(), text.get(), &loadedMode_)) return 1;
     // Flag 1 reads settings files: one holding a NUL byte is binary and never taken for one.
     if (flag != 0 && memchr(text->data(), '\0', text->size()) != nullptr) return 1;
     INIFileReader::Parse(*this, std::move(text));

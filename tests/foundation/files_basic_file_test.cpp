@@ -3,12 +3,14 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <string>
 #include <vector>
 
 #include "foundation/files/basic_file.h"
+#include "foundation/files/whole_file.h"
 #include "support/test_files.h"
 #include "support/unprivileged.h"
 
@@ -89,5 +91,46 @@ INSTANTIATE_TEST_SUITE_P(NotRegular, BasicFileSpecial,
                          ::testing::Values(SpecialFile{"pipe", O_RDONLY}, SpecialFile{"pipe", O_RDWR},
                                            SpecialFile{"/dev/zero", O_RDONLY},
                                            SpecialFile{"folder", O_RDONLY}));
+
+// The one whole-file reader: exact bytes whatever the size against its first guess, a limit that
+// refuses rather than truncates, and only regular files by path.
+TEST(WholeFile, ReadsExactBytesRefusesOverLimitAndOnlyRegularFilesByPath) {
+  vxtest::TempDir tmp;
+  std::string big(300 * 1024 + 7, '\0');
+  for (size_t i = 0; i < big.size(); ++i) big[i] = static_cast<char>(i * 7 + i / 251);
+  vxtest::WriteFile(tmp.Path("big"), big);
+  vxtest::WriteFile(tmp.Path("empty"), "");
+  std::string text = "stale";
+  mode_t mode = 0;
+  ASSERT_EQ(0, chmod(tmp.Path("big").c_str(), 0640));
+  ASSERT_TRUE(vxfiles::ReadWholeFile(tmp.Path("big"), &text, &mode));
+  EXPECT_TRUE(text == big);
+  EXPECT_EQ(0640u, mode);
+  ASSERT_TRUE(vxfiles::ReadWholeFile(tmp.Path("empty"), &text));
+  EXPECT_EQ("", text);
+  EXPECT_FALSE(vxfiles::ReadWholeFile(tmp.Path("big"), &text, nullptr, big.size() - 1));
+  EXPECT_EQ("", text);
+  EXPECT_TRUE(vxfiles::ReadWholeFile(tmp.Path("big"), &text, nullptr, big.size()));
+  EXPECT_FALSE(vxfiles::ReadWholeFile(tmp.Path("missing"), &text));
+  EXPECT_FALSE(vxfiles::ReadWholeFile(tmp.path(), &text));
+
+  // A descriptor of unknown size (a pipe) is read in growing chunks, and the limit still holds.
+  for (const size_t limit : {big.size(), big.size() - 1}) {
+    int ends[2];
+    ASSERT_EQ(0, pipe(ends));
+    const pid_t writer = fork();
+    if (writer == 0) {
+      close(ends[0]);
+      _exit(write(ends[1], big.data(), big.size()) == static_cast<ssize_t>(big.size()) ? 0 : 1);
+    }
+    close(ends[1]);
+    const bool read = vxfiles::ReadRest(ends[0], 0, limit, &text);
+    close(ends[0]);
+    int status = 0;
+    waitpid(writer, &status, 0);
+    EXPECT_EQ(limit == big.size(), read) << limit;
+    EXPECT_TRUE(read ? text == big : text.empty()) << limit;
+  }
+}
 
 }  // namespace
