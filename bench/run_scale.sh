@@ -81,7 +81,8 @@ for size in $sizes; do
       esac
     done
   done
-  if ! diff -r -x vxmigrate.log "$folder/reference" "$folder/run.1" >/dev/null; then
+  # The log and the undo journal hold times and inode numbers of their own run.
+  if ! diff -r -x vxmigrate.log -x .vxmigrate "$folder/reference" "$folder/run.1" >/dev/null; then
     echo "$0: warning: the runs of size $size did not give the same tree" >&2
   fi
   [[ ${VXM_SCALE_KEEP:-0} == 1 ]] || { rm -rf "$folder"; sync; }
