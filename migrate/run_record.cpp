@@ -111,6 +111,8 @@ bool IsStoredCredential(std::string value) {
 }  // namespace
 
 std::string vxReportValue(std::string_view key, std::string_view value) {
+  // An empty value hides nothing, and a credential the merge left empty must read as empty.
+  if (value.empty()) return "";
   std::string keyText(key);
   for (char& c : keyText) c = static_cast<char>(tolower(static_cast<unsigned char>(c)));
   const bool namedSecret = keyText.find("password") != std::string::npos ||

@@ -59,25 +59,29 @@ void AppendLines(const std::string& path, const Lines& lines) {
 // form of a user name or password masked whatever its key, other values as they are.
 TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
   struct Planted {
-    std::string key, source, kept;  // kept: empty when the destination lacks the key
-    const char *shownSource, *shownKept;
+    std::string key, source;
+    const char* kept;                     // null: the destination lacks the key
+    std::string shownSource, shownKept;  // shownKept "-": the key was added
   };
+  const std::string title = "Statistik f\xC3\xBCr B\xC3\xBCro", token(80, 'z'),
+                    keptUser = Protected("kept-user");
   const Planted planted[] = {
-      {"Account", Protected("stats-account"), "", "<protected>", nullptr},
-      {"RelayUser", Protected("relay-user"), Protected("kept-user"), "<protected>", "<protected>"},
-      {"Login", PreviousGenerationForm("old-login"), "", "<protected>", nullptr},
+      {"Account", Protected("stats-account"), nullptr, "<protected>", "-"},
+      {"RelayUser", Protected("relay-user"), keptUser.c_str(), "<protected>", "<protected>"},
+      {"Login", PreviousGenerationForm("old-login"), nullptr, "<protected>", "-"},
       {"Operator", LegacyEncoded("night-operator"), "admin", "<protected>", "admin"},
       {"ArchivePassword", "typed-in-clear", "other", "<protected>", "<protected>"},
-      {"Title", "Statistik f\xC3\xBCr B\xC3\xBCro", "Web Statistics", "Statistik f\xC3\xBCr B\xC3\xBCro",
-       "Web Statistics"},
-      {"Token", std::string(80, 'z'), "", nullptr, nullptr},  // 80 characters, not 80 digits
+      // The new installation's empty password won: the report must not hide that it is empty.
+      {"PagerPassword", LegacyEncoded("pager-secret"), "", "<protected>", ""},
+      {"Title", title, "Web Statistics", title, "Web Statistics"},
+      {"Token", token, nullptr, token, "-"},  // 80 characters, not 80 digits
       {"Code", "abc", "abd", "abc", "abd"}};
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   Lines source = {"[Notify]"}, kept = {"[Notify]"};
   for (const Planted& p : planted) {
     source.push_back(p.key + "=" + p.source);
-    if (!p.kept.empty()) kept.push_back(p.key + "=" + p.kept);
+    if (p.kept != nullptr) kept.push_back(p.key + "=" + p.kept);
   }
   AppendLines(run.src + "/vxm_log/vxm_log.ini", source);
   AppendLines(run.dst + "/vxm_vxx/vxm_vxx.ini", kept);
@@ -95,9 +99,7 @@ TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
     }
   }
   for (const Planted& p : planted) {
-    const std::string shownSource = p.shownSource == nullptr ? p.source : p.shownSource;
-    const std::string shownKept = p.kept.empty() ? "-" : p.shownKept;
-    EXPECT_EQ(std::make_pair(shownSource, shownKept), shown[p.key]) << p.key;
+    EXPECT_EQ(std::make_pair(p.shownSource, p.shownKept), shown[p.key]) << p.key;
   }
 }
 
