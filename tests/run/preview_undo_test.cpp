@@ -313,8 +313,11 @@ TEST_P(EveryShippedPlugin, ReportNamesThePlantedConflictAndNoCredentialInClear) 
                c["source"].text == planted.source && c["kept"].text == planted.kept;
     }
   }
-  EXPECT_EQ(1, found) << reportText;
-  // --report: under its file, the key with both values; the preview printed the same conflicts.
+  for (const vxJsonValue& file : report["files"].items) {
+    found += file["path"].text == planted.file && file["action"].text == "merged";
+  }
+  EXPECT_EQ(2, found) << reportText;  // the conflict, and its file as merged
+  // --report: under its file, the key with both values.
   const std::string conflict = std::string("    [") + planted.section + "] " + planted.key +
                                "\n      source: " + planted.source + "\n      kept:   " +
                                planted.kept + "\n";
@@ -325,7 +328,9 @@ TEST_P(EveryShippedPlugin, ReportNamesThePlantedConflictAndNoCredentialInClear) 
     end = shown.find('\n', end + 1);
   }
   EXPECT_NE(std::string::npos, shown.substr(file, end - file).find(conflict)) << shown;
+  // The preview printed the conflicts and the counts of the report the run then wrote.
   EXPECT_NE(std::string::npos, texts[0].find(shown.substr(0, shown.find("Files:\n")))) << texts[0];
+  EXPECT_NE(std::string::npos, texts[0].find(shown.substr(shown.rfind("Files: ")))) << texts[0];
 
   for (const std::string& secret : secrets) {
     for (size_t i = 0; i < texts.size(); ++i) {
