@@ -17,6 +17,7 @@
 #include <cstring>
 #include <vector>
 
+#include "crypt/previous_generation.h"
 #include "crypt/protected_value.h"
 #include "foundation/files/path_text.h"
 #include "foundation/string/json_text.h"
@@ -74,17 +75,44 @@ void AppendTexts(std::string& out, const char* name, const std::vector<std::stri
   out += texts.empty() ? "]" : "\n  ]";
 }
 
+bool IsPrintableText(const std::string& text) {
+  return std::all_of(text.begin(), text.end(), [](char c) { return c >= 0x20 && c < 0x7f; });
+}
+
+// A value in one of the forms old installations store user names and passwords in. Stored user
+// names sit under keys that do not say so ("SmtpUser", "Account"), so the form must tell. Both
+// older forms read back to the clear text without a key: showing them would show the password.
+//   protected:           "D9" ... "AB"
+//   previous generation: 80 hexadecimal digits
+//   legacy:              text XORed with a fixed pad; it holds bytes no one types and reads back
+//                        as printable text (a value of three characters or fewer may print
+//                        plainly and is not recognised)
+// A setting that merely looks like one of them is masked too: hiding it loses nothing.
+bool IsStoredCredential(std::string value) {
+  if (value.empty()) return false;
+  if (VXUI_IsOurTwoFish(value.data()) == 1) return true;
+  char clear[vxcrypt::kPreviousGenerationMaxValue + 1];
+  if (value.size() == vxcrypt::kPreviousGenerationDigits &&
+      vxcrypt::DecodePreviousGeneration(value.data(), clear)) {
+    return true;
+  }
+  if (IsPrintableText(value) || value.find('\0') != std::string::npos) return false;
+  const size_t size = value.size();
+  Obsolete_EncodePasswordOrUserName(value.data());  // its own inverse
+  return strlen(value.c_str()) == size && IsPrintableText(value);
+}
+
 }  // namespace
 
 std::string vxReportValue(std::string_view key, std::string_view value) {
+  // An empty value hides nothing, and a credential the merge left empty must read as empty.
+  if (value.empty()) return "";
   std::string keyText(key);
   for (char& c : keyText) c = static_cast<char>(tolower(static_cast<unsigned char>(c)));
   const bool namedSecret = keyText.find("password") != std::string::npos ||
                            keyText.find("passwd") != std::string::npos;
   std::string valueText(value);
-  if (namedSecret || (!valueText.empty() && VXUI_IsOurTwoFish(valueText.data()) == 1)) {
-    return "<protected>";
-  }
+  if (namedSecret || IsStoredCredential(valueText)) return "<protected>";
   return valueText;
 }
 

@@ -83,7 +83,8 @@ class vxRunRecord : public vxWriteObserver {
 };
 
 // The text a report shows for a value: "<protected>" for a stored password or user name (a value
-// in the protected form, or a key naming a password), the value itself otherwise.
+// in the protected, previous-generation or legacy form, or any value of a key naming a password),
+// the value itself otherwise (the empty value too).
 std::string vxReportValue(std::string_view key, std::string_view value);
 
 #endif  // VXMIGRATE_MIGRATE_RUN_RECORD_H_

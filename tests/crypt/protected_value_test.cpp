@@ -11,6 +11,8 @@
 #include <string>
 #include <tuple>
 
+#include "migrate/installations_fixture.h"
+
 namespace {
 
 unsigned char* Bytes(std::string& text) { return reinterpret_cast<unsigned char*>(&text[0]); }
@@ -66,23 +68,12 @@ TEST(ProtectedValue, WorkedValuesEncryptAndReadBackInEitherCase) {
   }
 }
 
-// The previous generation's form: four bytes of no meaning, the value and zero filler (40 bytes),
-// each byte but the last XORed with the one after it, in hexadecimal of the given case.
-std::string PreviousGenerationForm(const std::string& clear, const char* format) {
-  std::string bytes = "\x13\x57\x9B\xDF" + clear + std::string(37 - clear.size(), '\0');
-  std::string text(80, '\0');
-  for (int i = 0; i < 40; ++i) {
-    std::snprintf(&text[2 * i], 3, format, static_cast<unsigned char>(bytes[i] ^ bytes[i + 1]));
-  }
-  return text;
-}
-
 TEST(ProtectedValue, PreviousGenerationValuesReadAsClearTextGivenRoomFor37) {
   const std::string most = "thirty-six characters, the most: 36!";
   for (const auto& [clear, read] : {std::make_pair(std::string("cut\0here", 8), std::string("cut")),
                                     std::make_pair(most, most)}) {
-    for (const char* format : {"%02X", "%02x"}) {
-      std::string stored = PreviousGenerationForm(clear, format);
+    for (bool lowerCase : {false, true}) {
+      std::string stored = vxtest::PreviousGenerationForm(clear, lowerCase);
       EXPECT_EQ(Reading(1, read, 1), Decrypt(stored, 37));
       EXPECT_EQ(0, std::get<0>(Decrypt(stored, 36)));
     }

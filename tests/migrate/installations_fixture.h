@@ -11,6 +11,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cstdio>
 #include <initializer_list>
 #include <memory>
 #include <string>
@@ -127,6 +128,18 @@ inline unsigned int ModeOf(const std::string& path) {
 inline std::string LegacyEncoded(std::string clear) {
   Obsolete_EncodePasswordOrUserName(&clear[0]);
   return clear.c_str();
+}
+
+// The previous generation's 80-digit form of a clear text (36 characters at most): four bytes of no
+// meaning, the value and zero filler (40 bytes), each byte but the last XORed with the one after it.
+inline std::string PreviousGenerationForm(const std::string& clear, bool lowerCase = false) {
+  const std::string bytes = "\x13\x57\x9B\xDF" + clear + std::string(37 - clear.size(), '\0');
+  std::string text(80, '\0');
+  for (int i = 0; i < 40; ++i) {
+    std::snprintf(&text[2 * i], 3, lowerCase ? "%02x" : "%02X",
+                  static_cast<unsigned char>(bytes[i] ^ bytes[i + 1]));
+  }
+  return text;
 }
 
 // The clear text behind a value in the protected form; "<not protected>" for any other value.

@@ -11,9 +11,16 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <map>
 #include <string>
+#include <utility>
+#include <vector>
 
+#include "crypt/value_conversion.h"
+#include "foundation/inifile/ini_file.h"
+#include "foundation/string/json_text.h"
 #include "migrate/installations_fixture.h"
+#include "migrate/run_record.h"
 #include "run/host_run.h"
 #include "run/sample_run.h"
 #include "support/test_files.h"
@@ -39,84 +46,60 @@ std::map<std::string, std::string> Installation(const std::string& folder, bool 
   return tree;
 }
 
-// A user value in both installations' settings, different on each side.
-void PlantConflict(const HostRun& run) {
-  const std::string obx = run.dst + "/vxm_vxx/vxm_vxx.ini";
-  WriteFile(obx, ReadFile(obx) + "[Mail]\nSmtpServer=relay.internal\nSmtpPassword=" +
-                     "D94F4859206C3067E5EF5549BC4C8E82D9AB\n");
+// Lines added at the end of a settings file, ending as its lines end (the Halden sample's settings
+// end theirs in "\r\n").
+void AppendLines(const std::string& path, const Lines& lines) {
+  std::string text = ReadFile(path);
+  const std::string lineEnd = text.find("\r\n") == std::string::npos ? "\n" : "\r\n";
+  for (const std::string& line : lines) text += line + lineEnd;
+  WriteFile(path, text);
 }
 
-TEST(Preview, LeavesTheDestinationAsItWasAndReportsWhatTheRunThenDoes) {
+// How the report shows a value planted on either side of a merge, by the value's form: each stored
+// form of a user name or password masked whatever its key, other values as they are.
+TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
+  struct Planted {
+    std::string key, source;
+    const char* kept;                     // null: the destination lacks the key
+    std::string shownSource, shownKept;  // shownKept "-": the key was added
+  };
+  const std::string title = "Statistik f\xC3\xBCr B\xC3\xBCro", token(80, 'z'),
+                    keptUser = Protected("kept-user");
+  const Planted planted[] = {
+      {"Account", Protected("stats-account"), nullptr, "<protected>", "-"},
+      {"RelayUser", Protected("relay-user"), keptUser.c_str(), "<protected>", "<protected>"},
+      {"Login", PreviousGenerationForm("old-login"), nullptr, "<protected>", "-"},
+      {"Operator", LegacyEncoded("night-operator"), "admin", "<protected>", "admin"},
+      {"ArchivePassword", "typed-in-clear", "other", "<protected>", "<protected>"},
+      // The new installation's empty password won: the report must not hide that it is empty.
+      {"PagerPassword", LegacyEncoded("pager-secret"), "", "<protected>", ""},
+      {"Title", title, "Web Statistics", title, "Web Statistics"},
+      {"Token", token, nullptr, token, "-"},  // 80 characters, not 80 digits
+      {"Code", "abc", "abd", "abc", "abd"}};
   HostRun run({"halden_to_obx"});
   run.UseSamples();
-  PlantConflict(run);
-  const auto before = Installation(run.dst, true);
-  Lines options = run.SampleOptions();
-  options.push_back("-n");
-  ASSERT_EQ(0, run.Run(options)) << run.Err();
-  EXPECT_EQ(before, Installation(run.dst, true));
-  const std::string preview = run.Out();
-  EXPECT_NE(std::string::npos, preview.find("    [Mail] SmtpServer\n      source: mail.example.com\n"
-                                            "      kept:   relay.internal\n")) << preview;
-  // No scratch copy stays behind.
-  for (const std::string& name : ListTree(run.Path(""))) EXPECT_EQ(std::string::npos, name.find("vxpreview"));
-
-  ASSERT_EQ(0, run.Run(run.SampleOptions()));
-  ASSERT_EQ(0, run.Run({"--report", run.dst}));
-  const std::string real = run.Out();
-  // The preview printed the summary and the conflicts of the same report.
-  EXPECT_NE(std::string::npos, preview.find(real.substr(0, real.find("Files:\n")))) << real;
-  EXPECT_NE(std::string::npos, preview.find(real.substr(real.rfind("Files: ")))) << real;
-}
-
-// Lines added right after a section's header line, ending as that line ends (the Halden sample's
-// settings end their lines in "\r\n").
-std::string WithLinesAfter(const std::string& text, const std::string& header, const Lines& lines) {
-  const size_t at = text.find(header);
-  const size_t end = at == std::string::npos ? at : text.find('\n', at);
-  if (end == std::string::npos) {
-    ADD_FAILURE() << header << " not found";
-    return text;
+  Lines source = {"[Notify]"}, kept = {"[Notify]"};
+  for (const Planted& p : planted) {
+    source.push_back(p.key + "=" + p.source);
+    if (p.kept != nullptr) kept.push_back(p.key + "=" + p.kept);
   }
-  const std::string lineEnd = text[end - 1] == '\r' ? "\r\n" : "\n";
-  std::string added;
-  for (const std::string& line : lines) added += line + lineEnd;
-  return text.substr(0, end + 1) + added + text.substr(end + 1);
-}
-
-// Protected values from the source reach the merge as added keys and as conflicts, under names
-// that do not say "password": the report must know them by their form.
-TEST(Report, NamesConflictsWithBothValuesAndMasksProtectedOnes) {
-  HostRun run({"halden_to_obx"});
-  run.UseSamples();
-  PlantConflict(run);
-  const std::string sourceAccount = Protected("stats-account"), sourceRelay = Protected("relay-user"),
-                    keptRelay = Protected("kept-user");
-  const std::string obx = run.dst + "/vxm_vxx/vxm_vxx.ini";
-  WriteFile(obx, WithLinesAfter(ReadFile(obx), "[Mail]", {"RelayUser=" + keptRelay}));
-  const std::string halden = run.src + "/vxm_log/vxm_log.ini";
-  WriteFile(halden, WithLinesAfter(ReadFile(halden), "[Mail]",
-                                   {"SmtpPassword=" + Protected("source-secret"),
-                                    "Account=" + sourceAccount, "RelayUser=" + sourceRelay}));
+  AppendLines(run.src + "/vxm_log/vxm_log.ini", source);
+  AppendLines(run.dst + "/vxm_vxx/vxm_vxx.ini", kept);
   ASSERT_EQ(0, run.Run(run.SampleOptions()));
-  const std::string report = ReadFile(run.dst + "/vxmigrate-report.json");
-  for (const char* expected :
-       {"{\"section\": \"Mail\", \"key\": \"SmtpServer\", \"source\": \"mail.example.com\", "
-        "\"kept\": \"relay.internal\"}",
-        "{\"section\": \"Mail\", \"key\": \"Account\", \"value\": \"<protected>\"}",
-        "{\"section\": \"Mail\", \"key\": \"RelayUser\", \"source\": \"<protected>\", "
-        "\"kept\": \"<protected>\"}",
-        "{\"section\": \"Mail\", \"key\": \"SmtpPassword\", \"source\": \"<protected>\", "
-        "\"kept\": \"<protected>\"}",
-        "{\"path\": \"vxm_vxx/vxm_vxx.ini\", \"action\": \"merged\", "
-        "\"source\": \"vxm_log/vxm_log.ini\"}"}) {
-    EXPECT_NE(std::string::npos, report.find(expected)) << expected << "\n" << report;
+
+  vxJsonValue report;
+  ASSERT_TRUE(vxJsonParse(ReadFile(run.dst + "/vxmigrate-report.json"), report));
+  std::map<std::string, std::pair<std::string, std::string>> shown;  // key: source, kept
+  for (const vxJsonValue& merge : report["merges"].items) {
+    for (const vxJsonValue& added : merge["added"].items) {
+      if (added["section"].text == "Notify") shown[added["key"].text] = {added["value"].text, "-"};
+    }
+    for (const vxJsonValue& c : merge["conflicts"].items) {
+      if (c["section"].text == "Notify") shown[c["key"].text] = {c["source"].text, c["kept"].text};
+    }
   }
-  ASSERT_EQ(0, run.Run({"--report", run.dst}));
-  for (const std::string& secret : {sourceAccount, sourceRelay, keptRelay, Protected("source-secret"),
-                                    std::string("D94F4859206C3067E5EF5549BC4C8E82D9AB")}) {
-    EXPECT_EQ(std::string::npos, report.find(secret)) << secret;
-    EXPECT_EQ(std::string::npos, run.Out().find(secret)) << secret;
+  for (const Planted& p : planted) {
+    EXPECT_EQ(std::make_pair(p.shownSource, p.shownKept), shown[p.key]) << p.key;
   }
 }
 
@@ -238,6 +221,122 @@ TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeARunKilledMidway) {
   KillWhenJournalHas(run.Path(""), args, dst + "/.vxmigrate/runs/000001/journal", 6);
   ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
   EXPECT_EQ(before, Installation(dst, false));
+}
+
+// What each plug-in's samples hold for the report: a value the customer tuned that the new
+// installation's default overrides, and stored credentials the merges meet.
+struct StoredSecret {
+  const char *file, *section, *key;  // in the source installation
+  const char* clear;                 // what the stored form reads back to
+};
+struct PlantedInSamples {
+  const char* plugin;
+  const char *file, *section, *key, *source, *kept;  // the conflict; file in the destination
+  std::vector<StoredSecret> secrets;
+};
+
+const PlantedInSamples& Planted(const std::string& plugin) {
+  static const StoredSecret haldenMail[] = {
+      {"vxm_log/vxm_log.ini", "Mail", "SmtpUser", "shopstats-mailer"},           // legacy
+      {"vxm_log/vxm_log.ini", "Mail", "SmtpPassword", "Harbour-Lights-42"}};     // legacy
+  static const PlantedInSamples planted[] = {
+      {"halden_to_obx", "vxm_vxx/vxm_vxx.ini", "Mail", "SmtpServer", "mail.example.com",
+       "localhost", {haldenMail[0], haldenMail[1]}},
+      {"halsuite_to_halsuite", "vxm_log/vxm_log.ini", "Mail", "SmtpServer", "mail.example.com",
+       "localhost",
+       {haldenMail[0], haldenMail[1], {"vantix.ini", "Proxy", "ProxyUser", "gw-halden-01"}}},
+      {"log_to_log", "vantix.ini", "General", "ScheduleStart", "02:30", "01:00",
+       {{"vantix.ini", "Proxy", "ProxyUser", "proxy-shopstats"},                 // 80 digits
+        {"vantix.ini", "Proxy", "ProxyPassword", "Nightly#Run2019"}}},           // legacy
+      {"obx_to_obx", "vxm_vxx/vxm_vxx.ini", "Mail", "SmtpServer", "mail.example.com", "localhost",
+       {{"vxm_vxx/vxm_vxx.ini", "Mail", "SmtpUser", "obx-reports"},              // protected
+        {"vxm_vxx/vxm_vxx.ini", "Mail", "SmtpPassword", "Quarterly!Mail7"}}}};
+  for (const PlantedInSamples& p : planted) {
+    if (plugin == p.plugin) return p;
+  }
+  ADD_FAILURE() << plugin << " has no planted values";
+  return planted[0];
+}
+
+// The clear text of a stored user name or password in any of its forms.
+std::string ClearText(const std::string& stored) {
+  vxStringBase value(stored.c_str());
+  DecryptToClearText(value);  // protected and previous-generation forms
+  if (value.str() == stored) ConvertToClearText(value);  // the legacy form
+  return value.str();
+}
+
+// Every text a report holds: its raw JSON and each string in it, unescaped.
+void CollectTexts(const vxJsonValue& value, std::vector<std::string>& texts) {
+  if (value.kind == vxJsonValue::Kind::kString) texts.push_back(value.text);
+  for (const vxJsonValue& item : value.items) CollectTexts(item, texts);
+  for (const auto& [name, member] : value.members) {
+    texts.push_back(name);
+    CollectTexts(member, texts);
+  }
+}
+
+TEST_P(EveryShippedPlugin, ReportNamesThePlantedConflictAndNoCredentialInClear) {
+  const PlantedInSamples& planted = Planted(GetParam());
+  SampleRun run(GetParam());
+  // What must not show: each credential's clear text, and its stored form (the two older forms
+  // read back without a key).
+  std::vector<std::string> secrets;
+  for (const StoredSecret& s : planted.secrets) {
+    vxMappedINIFile settings(run.Path(run.source + "/" + s.file).c_str());
+    ASSERT_EQ(0, settings.Open(1)) << s.file;
+    const std::string stored = settings.GetVal(s.section, s.key).str();
+    ASSERT_NE(stored, s.clear) << s.key << ": the sample must hold it in a stored form";
+    ASSERT_EQ(s.clear, ClearText(stored)) << s.key;
+    secrets.insert(secrets.end(), {s.clear, stored});
+  }
+  Lines preview = run.RunOptions();
+  preview.push_back("-n");
+  ASSERT_EQ(0, run.Run(preview)) << run.Err();
+  std::vector<std::string> texts = {run.Out(), run.Err()};
+  ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
+  texts.insert(texts.end(), {run.Out(), run.Err()});
+  const std::string reportText = ReadFile(run.Path(run.destination + "/" + kRunReportName));
+  vxJsonValue report;
+  ASSERT_TRUE(vxJsonParse(reportText, report)) << reportText;
+  texts.push_back(reportText);
+  CollectTexts(report, texts);
+  ASSERT_EQ(0, run.Run({"--report", run.destination})) << run.Err();
+  const std::string shown = run.Out();
+  texts.push_back(shown);
+
+  int found = 0;
+  for (const vxJsonValue& merge : report["merges"].items) {
+    if (merge["file"].text != planted.file) continue;
+    for (const vxJsonValue& c : merge["conflicts"].items) {
+      found += c["section"].text == planted.section && c["key"].text == planted.key &&
+               c["source"].text == planted.source && c["kept"].text == planted.kept;
+    }
+  }
+  for (const vxJsonValue& file : report["files"].items) {
+    found += file["path"].text == planted.file && file["action"].text == "merged";
+  }
+  EXPECT_EQ(2, found) << reportText;  // the conflict, and its file as merged
+  // --report: under its file, the key with both values.
+  const std::string conflict = std::string("    [") + planted.section + "] " + planted.key +
+                               "\n      source: " + planted.source + "\n      kept:   " +
+                               planted.kept + "\n";
+  const size_t file = shown.find(std::string("\n  ") + planted.file + "  (from ");
+  ASSERT_NE(std::string::npos, file) << shown;
+  size_t end = shown.find('\n', file + 1);  // the file's group: its lines indented by four
+  while (end != std::string::npos && shown.compare(end + 1, 4, "    ") == 0) {
+    end = shown.find('\n', end + 1);
+  }
+  EXPECT_NE(std::string::npos, shown.substr(file, end - file).find(conflict)) << shown;
+  // The preview printed the conflicts and the counts of the report the run then wrote.
+  EXPECT_NE(std::string::npos, texts[0].find(shown.substr(0, shown.find("Files:\n")))) << texts[0];
+  EXPECT_NE(std::string::npos, texts[0].find(shown.substr(shown.rfind("Files: ")))) << texts[0];
+
+  for (const std::string& secret : secrets) {
+    for (size_t i = 0; i < texts.size(); ++i) {
+      EXPECT_EQ(std::string::npos, texts[i].find(secret)) << secret << " shown in text " << i;
+    }
+  }
 }
 
 INSTANTIATE_TEST_SUITE_P(Samples, EveryShippedPlugin, ::testing::ValuesIn(kShippedPlugins));
