@@ -9,6 +9,30 @@ namespace {
 
 using Kind = vxJsonValue::Kind;
 
+// A value as the terminal should show it: control bytes (a line feed, an escape sequence read
+// from a settings file) as \n, \r, \t or \xNN, so that a value can neither break the layout
+// nor drive the terminal. An empty value says so.
+std::string Shown(const std::string& value) {
+  if (value.empty()) return "(empty)";
+  std::string shown;
+  for (unsigned char c : value) {
+    if (c == '\n') {
+      shown += "\\n";
+    } else if (c == '\r') {
+      shown += "\\r";
+    } else if (c == '\t') {
+      shown += "\\t";
+    } else if (c < 0x20 || c == 0x7f) {
+      char hex[5];
+      snprintf(hex, sizeof hex, "\\x%02x", c);
+      shown += hex;
+    } else {
+      shown += static_cast<char>(c);
+    }
+  }
+  return shown;
+}
+
 void PrintConflicts(const vxJsonValue& report, FILE* out) {
   long total = report["summary"]["conflicts"].number;
   fprintf(out, "Conflicts (both held the key; the destination's value was kept): %lld\n",
@@ -17,8 +41,9 @@ void PrintConflicts(const vxJsonValue& report, FILE* out) {
     if (merge["conflicts"].items.empty()) continue;
     fprintf(out, "  %s  (from %s)\n", merge["file"].text.c_str(), merge["source"].text.c_str());
     for (const vxJsonValue& c : merge["conflicts"].items) {
-      fprintf(out, "    [%s] %s\n      source: %s\n      kept:   %s\n", c["section"].text.c_str(),
-              c["key"].text.c_str(), c["source"].text.c_str(), c["kept"].text.c_str());
+      fprintf(out, "    [%s] %s\n      source: %s\n      kept:   %s\n",
+              Shown(c["section"].text).c_str(), Shown(c["key"].text).c_str(),
+              Shown(c["source"].text).c_str(), Shown(c["kept"].text).c_str());
     }
   }
 }

@@ -75,7 +75,8 @@ TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
       {"PagerPassword", LegacyEncoded("pager-secret"), "", "<protected>", ""},
       {"Title", title, "Web Statistics", title, "Web Statistics"},
       {"Token", token, nullptr, token, "-"},  // 80 characters, not 80 digits
-      {"Code", "abc", "abd", "abc", "abd"}};
+      {"Code", "abc", "abd", "abc", "abd"},
+      {"Banner", "on\x1b[2Jair", "off", "on\x1b[2Jair", "off"}};  // a terminal's escape
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   Lines source = {"[Notify]"}, kept = {"[Notify]"};
@@ -101,6 +102,14 @@ TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
   for (const Planted& p : planted) {
     EXPECT_EQ(std::make_pair(p.shownSource, p.shownKept), shown[p.key]) << p.key;
   }
+  // On the terminal a value can neither drive it nor hide that it is empty.
+  ASSERT_EQ(0, run.Run({"--report", run.dst})) << run.Err();
+  EXPECT_EQ(std::string::npos, run.Out().find('\x1b')) << run.Out();
+  EXPECT_NE(std::string::npos, run.Out().find("[Notify] Banner\n      source: on\\x1b[2Jair\n"))
+      << run.Out();
+  EXPECT_NE(std::string::npos, run.Out().find("[Notify] PagerPassword\n      source: <protected>\n"
+                                              "      kept:   (empty)\n"))
+      << run.Out();
 }
 
 TEST(Undo, GivesBackTheExactTreeAndKeepsTheUndoneLog) {
