@@ -14,6 +14,7 @@
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/manager.h"
@@ -66,11 +67,16 @@ void CopyDataFolders(vxMigrationManager& manager, const vxStringBase& folder,
       manager.Log("Folder exists - no copy made: ", destination.c_str());
       continue;
     }
-    vxFileManager::CreateDirectory(destination, nullptr);
     vxStringBase source;
     vxFileManager::MakePath(source, sourceFolder, dataFolder, 0);
-    vxFileManager::CopyFile(source, destination, 1, 1, 0, 0, 0, nullptr, nullptr);
-    manager.Log("Folder copied:  ", destination.c_str());
+    // Made even when the source folder is empty: the profile looks for it.
+    const int copied = vxFileManager::CreateDirectory(destination, nullptr) != 0
+                           ? 1
+                           : vxFileManager::CopyFile(source, destination, 1, 1, 0, 0, 0, nullptr,
+                                                     nullptr);
+    if (vxCopied(manager, copied, source, destination)) {
+      manager.Log("Folder copied:  ", destination.c_str());
+    }
   }
 }
 
@@ -113,7 +119,6 @@ void RewriteProfileSettings(vxMigrationManager& manager, const vxStringBase& pat
   std::string declined;
   if (!ConvertLogProfile(manager, profile, declined)) {
     manager.Log(declined.c_str(), path.c_str());
-    profile.Close(0);
     return;
   }
   int written = flush ? profile.CloseFW(1) : profile.Close(1);

@@ -30,21 +30,31 @@ bool IsInstallationProfileFolder(const vxStringBase& folder) {
   return folder.at(0) == '.' && (folder.at(1) == '/' || folder.at(2) == '\\');
 }
 
+// Copies the folder from into the folder to. A profile without such a folder has nothing to carry
+// and counts as copied, as it always has; a copy that failed is logged as the error.
+bool CopiedOrAbsent(vxMigrationManager& manager, const vxStringBase& from,
+                    const vxStringBase& to) {
+  const int copied = vxFileManager::CopyFile(from, to, 1, 1, 0, 0, 0, nullptr, nullptr);
+  return vxCopied(manager, copied, from, to) || vxIsAbsent(from);
+}
+
 // The folders that carry one profile's data, copied beside its copy.
 void CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
                              const vxStringBase& newBase, const vxStringBase& newName) {
   vxStringBase reportsFrom, reportsTo;
   vxFileManager::MakePath(reportsFrom, manager.GetSourceDirectory(), kReports, profile.Filename());
   vxFileManager::MakePath(reportsTo, manager.GetDestinationDirectory(), kReports, newName);
-  vxFileManager::CopyFile(reportsFrom, reportsTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-  manager.Log("Report folder copied: ", reportsTo.c_str());
+  if (CopiedOrAbsent(manager, reportsFrom, reportsTo)) {
+    manager.Log("Report folder copied: ", reportsTo.c_str());
+  }
 
   vxStringBase databaseFrom, databaseTo;
   vxFileManager::MakePath(databaseFrom, manager.GetSourceDirectory(), kDatabases,
                           profile.BaseName());
   vxFileManager::MakePath(databaseTo, manager.GetDestinationDirectory(), kDatabases, newBase);
-  vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-  manager.Log("Database folder copied: ", databaseTo.c_str());
+  if (CopiedOrAbsent(manager, databaseFrom, databaseTo)) {
+    manager.Log("Database folder copied: ", databaseTo.c_str());
+  }
 }
 
 // A profile without its report folders creates its reports on demand unless it says otherwise;

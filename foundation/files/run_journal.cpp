@@ -230,17 +230,19 @@ bool vxRunJournal::BeforeFolder(std::string_view folder) {
   return true;
 }
 
-void vxRunJournal::Finish(int result) {
+bool vxRunJournal::Finish(int result) {
+  bool ok = true;
   for (const std::string& relative : order_) {
     struct stat st;
     if (lstat(Join(destination_, relative).c_str(), &st) != 0) {
-      Append("after " + vxJournalEscape(relative) + " -");
+      ok = Append("after " + vxJournalEscape(relative) + " -") && ok;
       continue;
     }
-    Append("after " + vxJournalEscape(relative) + " " + std::to_string(st.st_ino) + " " +
-           std::to_string(st.st_size) + " " + std::to_string(st.st_mtim.tv_sec) + " " +
-           std::to_string(st.st_mtim.tv_nsec) + " " + std::to_string(st.st_mode));
+    ok = Append("after " + vxJournalEscape(relative) + " " + std::to_string(st.st_ino) + " " +
+                std::to_string(st.st_size) + " " + std::to_string(st.st_mtim.tv_sec) + " " +
+                std::to_string(st.st_mtim.tv_nsec) + " " + std::to_string(st.st_mode)) &&
+         ok;
   }
-  Append("end " + std::to_string(result));
-  fsync(fd_);
+  ok = Append("end " + std::to_string(result)) && ok;
+  return fsync(fd_) == 0 && ok;
 }
