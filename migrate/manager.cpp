@@ -127,7 +127,12 @@ void vxMigrationManager::NoteEntry(const std::string& entry) {
 
 void vxMigrationManager::SetRunListener(vxRunListener* listener) {
   m_listener = listener;
-  if (listener != nullptr && m_log != nullptr) WriteHeader(listener);
+  if (listener == nullptr || m_log == nullptr) return;
+  WriteHeader(listener);
+  // Logged right after the header, before any listener could be there.
+  if (LacksJournal() && m_log->IsOpen()) {
+    listener->OnLogEntry(vxLogFile::EntryText(kNoJournal, m_destinationDirectory.c_str()));
+  }
 }
 
 // The command file fills in what the command line lacks: its "main" keys overwrite the options of
@@ -193,11 +198,15 @@ void vxMigrationManager::OpenDoorsAndLog() {
   vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
   m_log = new vxLogFile(path, 1);
   WriteHeader(nullptr);
-  if (m_settings.keepJournal && m_record != nullptr && m_record->Journal() == nullptr &&
-      m_log->IsOpen()) {
-    Log("** No undo journal could be kept; this run cannot be undone: ",
-        m_destinationDirectory.c_str());
-  }
+  if (LacksJournal() && m_log->IsOpen()) Log(kNoJournal, m_destinationDirectory.c_str());
+}
+
+// The run still migrates (its files are as good), but a promise is broken: an error.
+const char vxMigrationManager::kNoJournal[] =
+    "Error: No undo journal could be kept; this run cannot be undone: ";
+
+bool vxMigrationManager::LacksJournal() const {
+  return m_settings.keepJournal && m_record != nullptr && m_record->Journal() == nullptr;
 }
 
 vxIniMergeObserver* vxMigrationManager::RecordMerge(const vxStringBase& source,

@@ -216,6 +216,9 @@ class VXM_EXPORT vxMigrationManager {
   void ReadCommandFile();
   void FindExecutable();
   void OpenDoorsAndLog();
+  // The run was asked to keep an undo journal and could not start one.
+  bool LacksJournal() const;
+  static const char kNoJournal[];
   void WriteHeader(vxRunListener* listener);
   void NoteEntry(const std::string& entry);
   void RunPlugins(bool& found);

@@ -53,6 +53,8 @@ class AtomicFileWriter {
 
  private:
   void Abandon();
+  // Abandons the write after a failed call (errno), which the run's doors are told of; false.
+  bool Fail();
 
   ReplaceTarget target_;
   std::string name_;      // the target's name within its folder

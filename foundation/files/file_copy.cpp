@@ -120,12 +120,24 @@ Outcome CheckDestination(const CopyJob& job, int dstDirFd, const char* name, con
   return Newer(src.st.st_mtim, dst.st_mtim) ? Outcome::kCopied : Outcome::kLeftInPlace;
 }
 
+// Whether setting a mode or times worked, or failed only because the destination's file system
+// cannot hold them (a copy onto such a disk keeps its content all the same).
+bool KeptOrUnsupported(int result) {
+  return result == 0 || errno == EPERM || errno == ENOTSUP || errno == EOPNOTSUPP;
+}
+
 // A folder the copy created takes its source's mode and times once it is filled (filling it would
-// change its times again).
-void StampFolder(int fd, const struct stat& source) {
+// change its times again). False when the disk failed to take them.
+bool StampFolder(int fd, const struct stat& source) {
   const struct timespec times[2] = {source.st_atim, source.st_mtim};
-  fchmod(fd, source.st_mode & 07777);
-  futimens(fd, times);
+  return KeptOrUnsupported(fchmod(fd, source.st_mode & 07777)) &&
+         KeptOrUnsupported(futimens(fd, times));
+}
+
+// Records a failed write of the copy (errno) on path: the copy fails, and the run's doors hear it.
+void NoteFailure(CopyJob& job, const std::string& path) {
+  job.failed = true;
+  vxfiles::NoteWriteFailure(errno, path);
 }
 
 // Copies the content of in to out, both at their current offsets. The kernel copy serves the
@@ -158,7 +170,7 @@ bool CopyBytes(CopyJob& job, int in, int out, off_t size) {
 }
 
 // Writes the temporary entry for src; mode and times are kept where the file system can hold
-// them (a failure there does not fail the copy, the content does).
+// them (only a disk that fails to take them fails the copy).
 bool WriteTemp(CopyJob& job, const Source& src, int dstDirFd, const char* name,
                std::string& temp) {
   const struct timespec times[2] = {src.st.st_atim, src.st.st_mtim};
@@ -166,17 +178,14 @@ bool WriteTemp(CopyJob& job, const Source& src, int dstDirFd, const char* name,
     if (vxfiles::CreateTempLinkAt(dstDirFd, name, src.linkTarget.c_str(), temp) != 0) {
       return false;
     }
-    utimensat(dstDirFd, temp.c_str(), times, AT_SYMLINK_NOFOLLOW);
-    return true;
+    return KeptOrUnsupported(utimensat(dstDirFd, temp.c_str(), times, AT_SYMLINK_NOFOLLOW));
   }
   // 0600 until complete: nobody else reads a file that is still being written.
   UniqueFd out(vxfiles::CreateTempFileAt(dstDirFd, name, 0600, temp));
   if (!out.valid()) return false;
-  bool ok = CopyBytes(job, src.fd.get(), out.get(), src.st.st_size);
-  if (ok) {
-    fchmod(out.get(), src.st.st_mode & 07777);
-    futimens(out.get(), times);
-  }
+  const bool ok = CopyBytes(job, src.fd.get(), out.get(), src.st.st_size) &&
+                  KeptOrUnsupported(fchmod(out.get(), src.st.st_mode & 07777)) &&
+                  KeptOrUnsupported(futimens(out.get(), times));
   return out.Close() && ok;
 }
 
@@ -194,6 +203,7 @@ Outcome WriteDestination(CopyJob& job, const Source& src, int dstDirFd, const ch
   if (!temp.empty()) unlinkat(dstDirFd, temp.c_str(), 0);
   // Created by someone else since the check: theirs stays.
   if (written && error == EEXIST && !job.replace) return Outcome::kLeftInPlace;
+  vxfiles::NoteWriteFailure(error, job.destPath.empty() ? name : job.destPath + "/" + name);
   return Outcome::kFailed;
 }
 
@@ -234,6 +244,7 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   // Made private while it fills (a read-only source folder must not lock us out of its copy);
   // its own mode and times follow once it is complete.
   bool fresh = vxfiles::MayWriteAt(dstParent, name) && mkdirat(dstParent, name, 0700) == 0;
+  if (!fresh && errno != EEXIST) vxfiles::NoteWriteFailure(errno, job.destPath);
   UniqueFd dstFd((fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder | O_NOFOLLOW)
                                             : -1);
   // An existing destination folder that is a link is written through only when it leads to a
@@ -250,8 +261,8 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   job.openFolders.push_back(id);
   CopyFolderContents(job, srcFd.get(), dstFd.get(), fresh, depth);
   job.openFolders.pop_back();
+  if (fresh && !StampFolder(dstFd.get(), st)) NoteFailure(job, job.destPath);
   job.destPath.resize(parentPathSize);
-  if (fresh) StampFolder(dstFd.get(), st);
 }
 
 void CopyFolderContents(CopyJob& job, int srcFd, int dstFd, bool destFresh, int depth) {
@@ -292,6 +303,8 @@ UniqueFd OpenDestinationFolder(const std::string& path, bool& fresh) {
   fresh = mkdir(folder.c_str(), 0777) == 0;
   if (!fresh && errno == ENOENT) {
     fresh = vxFileManager::CreateDirectory(vxStringBase(std::string_view(folder)), nullptr) == 0;
+  } else if (!fresh && errno != EEXIST) {
+    vxfiles::NoteWriteFailure(errno, folder);
   }
   return UniqueFd(open(folder.c_str(), kOpenFolder));
 }
@@ -375,7 +388,7 @@ int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to)
   if (job.destRoot != srcId) {
     job.openFolders.push_back(srcId);
     CopyFolderContents(job, srcFd.get(), dstFd.get(), fresh, 0);
-    if (fresh) StampFolder(dstFd.get(), st);
+    if (fresh && !StampFolder(dstFd.get(), st)) NoteFailure(job, job.destPath);
   }
   return job.failed ? 1 : 0;
 }

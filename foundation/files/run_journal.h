@@ -58,6 +58,8 @@ class vxRunJournal {
 
   bool Relative(const std::string& absolute, std::string& relative) const;
   [[nodiscard]] bool KeepOld(const std::string& relative, const std::string& path, bool inPlace);
+  // One record line; Append also tells the run's doors when it fails.
+  [[nodiscard]] bool Write(const std::string& record);
   [[nodiscard]] bool Append(const std::string& record);
 
   std::string destination_;
