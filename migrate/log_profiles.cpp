@@ -5,6 +5,7 @@
 // credential that cannot be protected, is logged and left exactly as copied. Results are always 0.
 
 #include <cstring>
+#include <filesystem>
 #include <string>
 #include <unordered_set>
 #include <vector>
@@ -12,6 +13,7 @@
 #include "crypt/protected_value.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/exclusion_index.h"
 #include "migrate/failed_copy.h"
@@ -35,6 +37,16 @@ const char* SelectionOption(const vxStringBase& extension) {
 bool IsProtected(const vxStringBase& value) {
   std::vector<char> text(value.c_str(), value.c_str() + value.length() + 1);
   return VXUI_IsOurTwoFish(text.data()) == 1;
+}
+
+// A data folder this step made and could not fill because the disk failed (every later write of
+// the run is refused then): taken away again, so that the next run, finding none, copies it
+// whole rather than leaving it half filled as one that "exists". Only what the step just made.
+void TakeBackHalfCopiedFolder(const vxStringBase& folder) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  if (doors == nullptr || doors->StoppedBy() == 0) return;
+  std::error_code ignored;
+  std::filesystem::remove_all(folder.str(), ignored);
 }
 
 // Copies the data folders ("<profile>.dat") of the profiles that were not left behind, under their
@@ -76,6 +88,8 @@ void CopyDataFolders(vxMigrationManager& manager, const vxStringBase& folder,
                                                      nullptr);
     if (vxCopied(manager, copied, source, destination)) {
       manager.Log("Folder copied:  ", destination.c_str());
+    } else {
+      TakeBackHalfCopiedFolder(destination);
     }
   }
 }

@@ -6,12 +6,14 @@
 #define VXMIGRATE_TESTS_RUN_COUNTDOWN_RUN_H_
 
 #include <fnmatch.h>
+#include <stdlib.h>
 
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <iterator>
 #include <map>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
@@ -21,6 +23,8 @@
 namespace vxtest {
 
 using Tree = std::map<std::string, std::string>;
+// Every whole version a run put in place, by name below its destination, as Tree holds them.
+using Versions = std::map<std::string, std::set<std::string>>;
 
 // Sets environment variables for the host runs started while it lives; restores them afterwards.
 class ScopedEnvironment {
@@ -65,6 +69,23 @@ inline long CountedChanges(const std::string& countFile) {
   return std::atol(ReadFile(countFile).c_str());
 }
 
+// The versions the shim kept in folder (VXM_VERSIONS_DIR) of files below destination.
+inline Versions KeptVersions(const std::string& folder, const std::string& destination) {
+  Versions versions;
+  char* real = realpath(destination.c_str(), nullptr);
+  const std::string root = std::string(real != nullptr ? real : destination.c_str()) + "/";
+  free(real);
+  const std::string index = ReadFile(folder + "/index");
+  for (size_t at = 0, end; (end = index.find('\n', at)) != std::string::npos; at = end + 1) {
+    const std::string line = index.substr(at, end - at);
+    const size_t tab = line.find('\t');
+    const std::string path = tab == std::string::npos ? "" : line.substr(tab + 1);
+    if (path.rfind(root, 0) != 0) continue;
+    versions[path.substr(root.size())].insert(ReadFile(folder + "/" + line.substr(0, tab)));
+  }
+  return versions;
+}
+
 inline bool IsTemporaryName(const std::string& relative) {
   const std::string name = relative.substr(relative.rfind('/') + 1);
   return fnmatch(".*.vxtmp.*", name.c_str(), 0) == 0;
@@ -97,17 +118,20 @@ inline std::vector<std::string> Differences(const Tree& expected, const Tree& ac
 }
 
 // Entries of a disturbed run's destination that are neither as before nor as after an undisturbed
-// run: a file with other bytes, one the finished run does not have, or one lost that both runs
+// run (nor, given versions, one of the whole versions the undisturbed run put in place on its
+// way): a file with other bytes, one the finished run does not have, or one lost that both runs
 // keep. Temporary files are left out: a run may leave them, the next run removes them.
 inline std::vector<std::string> Misfits(const Tree& before, const Tree& after,
-                                        const Tree& disturbed) {
+                                        const Tree& disturbed, const Versions& versions = {}) {
   std::vector<std::string> names;
   for (const auto& [name, state] : disturbed) {
     if (IsBookkeeping(name) || IsTemporaryName(name)) continue;
     auto old = before.find(name), finished = after.find(name);
+    auto passed = versions.find(name);
     const bool asBefore = old != before.end() && old->second == state;
     const bool asAfter = finished != after.end() && finished->second == state;
-    if (!asBefore && !asAfter) names.push_back(name);
+    const bool onTheWay = passed != versions.end() && passed->second.count(state) != 0;
+    if (!asBefore && !asAfter && !onTheWay) names.push_back(name);
   }
   for (const auto& [name, state] : before) {
     if (!IsBookkeeping(name) && after.count(name) != 0 && disturbed.count(name) == 0) {

@@ -4,6 +4,8 @@
 // VXM_KILL_BEFORE=N kills; VXM_FAIL_AT=N with VXM_FAIL_ERRNO=number fails (unset or 0: never).
 // VXM_COUNT_FILE=path receives, at a normal exit, the number of such calls the process made;
 // VXM_FAULT_NOTE_FILE=path receives the failed call as "name<TAB>path" when it happens.
+// VXM_VERSIONS_DIR=folder receives every version of a file the process puts in place by a rename
+// or a link (numbered files holding "mode bytes", as the tests compare trees, listed in "index").
 // Counted: creating or writing opens, writes to descriptors above 2, kernel copies, renames,
 // links, removals, new folders, truncation, mode and time changes, syncs. Built for tests only.
 
@@ -52,30 +54,65 @@ __attribute__((destructor)) static void ReportChanges(void) {
   fclose(file);
 }
 
-// Where the failed call would have written: the path as given, made absolute from the folder
-// open at dir (or the current folder); or, with no path, the file open at fd.
-static void NoteFailure(const char* call, int fd, const char* path) {
-  const char* notePath = getenv("VXM_FAULT_NOTE_FILE");
-  if (notePath == NULL) return;
+// Where the entry path of the folder open at dir (or the current folder) is, as an absolute path.
+static void AbsolutePath(int dir, const char* path, char* out, size_t size) {
   char folder[PATH_MAX] = "";
-  char link[64];
-  if (path == NULL || path[0] != '/') {
+  if (path[0] != '/') {
     ssize_t n = -1;
-    if (fd == AT_FDCWD) {
+    if (dir == AT_FDCWD) {
       n = getcwd(folder, sizeof folder) != NULL ? (ssize_t)strlen(folder) : -1;
     } else {
-      snprintf(link, sizeof link, "/proc/self/fd/%d", fd);
+      char link[64];
+      snprintf(link, sizeof link, "/proc/self/fd/%d", dir);
       n = readlink(link, folder, sizeof folder - 1);
     }
     folder[n > 0 ? n : 0] = '\0';
   }
+  snprintf(out, size, "%s%s%s", folder, folder[0] != '\0' ? "/" : "", path);
+}
+
+// Keeps the version of the file just put in place at path (see VXM_VERSIONS_DIR).
+static void KeepVersion(int dir, const char* path) {
+  const char* versions = getenv("VXM_VERSIONS_DIR");
+  if (versions == NULL) return;
+  static long kept;
+  char absolute[PATH_MAX], copy[PATH_MAX], index[PATH_MAX];
+  AbsolutePath(dir, path, absolute, sizeof absolute);
+  struct stat st;
+  if (lstat(absolute, &st) != 0 || !S_ISREG(st.st_mode)) return;
+  snprintf(copy, sizeof copy, "%s/%ld", versions, ++kept);
+  snprintf(index, sizeof index, "%s/index", versions);
+  FILE* in = fopen(absolute, "rb");  // stdio's own opens and writes do not pass through this shim
+  FILE* out = fopen(copy, "wb");
+  FILE* list = fopen(index, "a");
+  if (in != NULL && out != NULL && list != NULL) {
+    fprintf(out, "%04o ", (unsigned)(st.st_mode & 07777));
+    char buffer[65536];
+    for (size_t n; (n = fread(buffer, 1, sizeof buffer, in)) > 0;) fwrite(buffer, 1, n, out);
+    fprintf(list, "%ld\t%s\n", kept, absolute);
+  }
+  if (in != NULL) fclose(in);
+  if (out != NULL) fclose(out);
+  if (list != NULL) fclose(list);
+}
+
+// Notes the failed call (see VXM_FAULT_NOTE_FILE): where it would have written, or the file open
+// at fd when it names no path.
+static void NoteFailure(const char* call, int fd, const char* path) {
+  const char* notePath = getenv("VXM_FAULT_NOTE_FILE");
+  if (notePath == NULL) return;
+  char where[PATH_MAX];
+  if (path != NULL) {
+    AbsolutePath(fd, path, where, sizeof where);
+  } else {
+    char link[64];
+    snprintf(link, sizeof link, "/proc/self/fd/%d", fd);
+    const ssize_t n = readlink(link, where, sizeof where - 1);
+    where[n > 0 ? n : 0] = '\0';
+  }
   FILE* note = fopen(notePath, "w");
   if (note == NULL) return;
-  if (path == NULL) {
-    fprintf(note, "%s\t%s\n", call, folder);
-  } else {
-    fprintf(note, "%s\t%s%s%s\n", call, folder, folder[0] != '\0' ? "/" : "", path);
-  }
+  fprintf(note, "%s\t%s\n", call, where);
   fclose(note);
 }
 
@@ -106,6 +143,15 @@ static void* Next(void** slot, const char* name) {
     return ((result(*) params)Next(&real, #name)) args;           \
   }
 #define CWD AT_FDCWD
+// As FORWARD, for a call that puts a file in place at path: its new version is kept.
+#define FORWARD_PLACING(result, name, params, args, fd, path)                 \
+  result name params {                                                        \
+    static void* real;                                                        \
+    if (Countdown(#name, fd, path)) return -1;                                \
+    result done = ((result(*) params)Next(&real, #name)) args;                \
+    if (done == 0) KeepVersion(fd, path);                                     \
+    return done;                                                              \
+  }
 
 FORWARD(ssize_t, write, (int fd, const void* data, size_t size), (fd, data, size), fd > 2, fd,
         NULL)
@@ -122,15 +168,16 @@ FORWARD(ssize_t, sendfile, (int out, int in, off_t* at, size_t size), (out, in, 
         NULL)
 FORWARD(ssize_t, sendfile64, (int out, int in, off64_t* at, size_t size), (out, in, at, size), 1,
         out, NULL)
-FORWARD(int, rename, (const char* from, const char* to), (from, to), 1, CWD, to)
-FORWARD(int, renameat, (int fromDir, const char* from, int toDir, const char* to),
-        (fromDir, from, toDir, to), 1, toDir, to)
-FORWARD(int, renameat2,
-        (int fromDir, const char* from, int toDir, const char* to, unsigned int flags),
-        (fromDir, from, toDir, to, flags), 1, toDir, to)
-FORWARD(int, link, (const char* from, const char* to), (from, to), 1, CWD, to)
-FORWARD(int, linkat, (int fromDir, const char* from, int toDir, const char* to, int flags),
-        (fromDir, from, toDir, to, flags), 1, toDir, to)
+FORWARD_PLACING(int, rename, (const char* from, const char* to), (from, to), CWD, to)
+FORWARD_PLACING(int, renameat, (int fromDir, const char* from, int toDir, const char* to),
+                (fromDir, from, toDir, to), toDir, to)
+FORWARD_PLACING(int, renameat2,
+                (int fromDir, const char* from, int toDir, const char* to, unsigned int flags),
+                (fromDir, from, toDir, to, flags), toDir, to)
+FORWARD_PLACING(int, link, (const char* from, const char* to), (from, to), CWD, to)
+FORWARD_PLACING(int, linkat,
+                (int fromDir, const char* from, int toDir, const char* to, int flags),
+                (fromDir, from, toDir, to, flags), toDir, to)
 FORWARD(int, symlink, (const char* target, const char* path), (target, path), 1, CWD, path)
 FORWARD(int, symlinkat, (const char* target, int dir, const char* path), (target, dir, path), 1,
         dir, path)
