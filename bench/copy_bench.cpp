@@ -126,8 +126,12 @@ void BM_CopyAllFilesOfType(benchmark::State& state) {
 
 void BM_FileManagerTreeCopy(benchmark::State& state) {
   TimeCopy(state, "dst_tree", [](const std::string& destination) {
-    vxFileManager::CopyFile(vxStringBase((g_root + "/src").c_str()), vxStringBase(destination.c_str()),
-                            1, 0, 0, 0, 0, nullptr, nullptr);
+    if (vxFileManager::CopyFile(vxStringBase((g_root + "/src").c_str()),
+                                vxStringBase(destination.c_str()), 1, 0, 0, 0, 0, nullptr,
+                                nullptr) != 0) {
+      fprintf(stderr, "failed: the tree copy into %s\n", destination.c_str());
+      std::exit(1);
+    }
   });
 }
 

@@ -68,8 +68,7 @@ void BM_OpenParse(benchmark::State& state) {
   MakeBigFile();
   vxMappedINIFile ini(kBigFile);
   for (auto _ : state) {
-    if (ini.Open(1) != 0) state.SkipWithError("open failed");
-    ini.Close(0);
+    if (ini.Open(1) != 0 || ini.Close(0) != 0) state.SkipWithError("open failed");
   }
   state.SetBytesProcessed(static_cast<int64_t>(state.iterations()) * FileSize(kBigFile));
 }
@@ -102,8 +101,7 @@ void BM_MergeFrom100kInto100k(benchmark::State& state) {
     dst.MergeFrom(src);
     state.PauseTiming();
     if (dst.GetPropertyList("Keys")->size() != 150000) state.SkipWithError("wrong merge");
-    dst.Close(0);
-    src.Close(0);
+    if (dst.Close(0) != 0 || src.Close(0) != 0) state.SkipWithError("close failed");
     state.ResumeTiming();
   }
 }

@@ -115,8 +115,7 @@ void BM_AdvancedOptionsFilesOnly(benchmark::State& state) {
     vxMappedINIFile source(installations.Path(std::string("src") + kFile).c_str());
     vxMappedINIFile destination(installations.Path(std::string("dst") + kFile).c_str());
     if (source.Open(0) != 0 || destination.Open(1) != 0) state.SkipWithError("open failed");
-    source.Close(0);
-    destination.Close(1);
+    if (source.Close(0) != 0 || destination.Close(1) != 0) state.SkipWithError("write failed");
   }
   state.SetItemsProcessed(state.iterations() * n * 2);
 }

@@ -12,6 +12,7 @@
 #include "edition/edition_util.h"
 #include "edition/halden_to_obx.h"
 #include "foundation/files/file_manager.h"
+#include "migrate/failed_copy.h"
 #include "migrate/manager.h"
 
 namespace {
@@ -104,6 +105,7 @@ int HaldenToOBXHelper::DoMergeAdvancedOptionsFiles() {
     }
 
     int64_t next = destinationCount;
+    int added = 0;  // logged once the file is written
     for (int64_t i : NumberedSections(source, "QueryProfile", sourceCount)) {
       const INILineList* lines =
           source.GetPropertyList(vxStringBase(NumberedName("QueryProfile", i)));
@@ -130,11 +132,13 @@ int HaldenToOBXHelper::DoMergeAdvancedOptionsFiles() {
       destination.SetVal(vxStringBase(section), "Parameter", parameter);
       destination.SetVal(vxStringBase(section), "MapFile", mapFile);
       destination.SetVal("Default", countKey, vxStringBase(std::to_string(next + 1)));
-      manager_->Log("Advanced option file migrated: ", kSourceDynamicPages);
+      ++added;
       ++next;
     }
-    source.Close(0);
-    destination.Close(1);
+    if (!vxWroteBack(*manager_, destination)) return 1;
+    for (int i = 0; i < added; ++i) {
+      manager_->Log("Advanced option file migrated: ", kSourceDynamicPages);
+    }
     return 0;
   }
 
@@ -156,7 +160,8 @@ int HaldenToOBXHelper::DoMergeAdvancedOptionsFiles() {
       }
     }
   }
-  manager_->Log("Advanced option file migrated: ", destinationPath.c_str());
-  destination.Close(1);
+  const vxStringBase migrated(destinationPath);
+  if (!vxWroteBack(*manager_, destination)) return 1;
+  manager_->Log("Advanced option file migrated: ", migrated.c_str());
   return 0;
 }

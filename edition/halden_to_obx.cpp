@@ -117,7 +117,6 @@ int HaldenToOBXHelper::DoVXMLogINIMigrate() {
     destination.SetVal("Defaults", "useglobalquerystrings", 0L);
   }
 
-  source.Close(0);
   if (destination.Close(1) != 0) {
     // An existing server settings file that could not be read is never replaced.
     manager_->Log(bothOpen ? "Error: Unable to write file:   " : "Error: Unable to open file:   ",

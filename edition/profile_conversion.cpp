@@ -79,7 +79,6 @@ class AdvancedOptionIds {
       ids.append(id);
       ids.append(' ');
     }
-    file.Close(0);
     return true;
   }
 

@@ -21,6 +21,10 @@
 
 namespace {
 
+// Empties a template held for one conversion. Closing without saving writes nothing, so there is
+// no failure to look at.
+void Release(vxMappedINIFile& file) { static_cast<void>(file.Close(0)); }
+
 const char kTemplateFolder[] = "\\vxm_log\\datfiles";
 const char kServerFolder[] = "\\vxm_vxx";
 const char kStandardTemplate[] = "CompleteSummary.wct";
@@ -128,7 +132,7 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
   vxStringBase buffer;
   sourceTemplate_.GetVal("SaveAs", "SaveReportAs", buffer);
   if (!IsAcceptedOutputForm(buffer, DestinationMajor(manager_))) {
-    sourceTemplate_.Close(0);
+    Release(sourceTemplate_);
     return 0;
   }
 
@@ -142,7 +146,7 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
     vxFileManager::MakePath(standardPath, destinationFolder_, kServerFolder, kStandardTemplate);
     standardTemplate_.SetFilename(standardPath);
     if (standardTemplate_.Open(1) != 0) {
-      sourceTemplate_.Close(0);
+      Release(sourceTemplate_);
       manager_->Log("Error: MSS to WCT conversion failed: ", conversion.c_str());
       return 0;
     }
@@ -181,10 +185,10 @@ int HaldenToOBXHelper::ConvertMSSToWCT(vxFilename& file) {
   sourceSection_ = nullptr;
   destinationSection_ = nullptr;
 
-  sourceTemplate_.Close(0);
+  Release(sourceTemplate_);
   // Written once, complete, and never over a template that appeared since the check.
   const int written = destinationTemplate_.CreateAs(targetPath);
-  destinationTemplate_.Close(0);
+  Release(destinationTemplate_);
   if (written != 0) {
     manager_->Log("Error: MSS to WCT conversion failed: ", conversion.c_str());
     return 0;

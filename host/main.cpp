@@ -58,7 +58,8 @@ int Migrate(HostOptions& options, const vxRunSettings& settings, bool preview) {
   }
   if (!preview) report.PrintSummary(manager, result, log->WriteError());
   HostExitStatus status = RunExitStatus(manager, result, log->WriteError());
-  manager.FinishRun(status);
+  // The report or the journal lost: the run's record is incomplete, which is a failed step too.
+  if (manager.FinishRun(status) != 0 && status == kExitDone) status = kExitStepErrors;
   return status;
 }
 

@@ -43,12 +43,6 @@ void TerminalReport::OnLogEntry(const std::string& entry) {
   if (manager_ != nullptr) progress_.Update(entry, manager_->GetFilesWritten());
 }
 
-void TerminalReport::OnUnloggedFailure(const std::string& text) {
-  progress_.Clear();
-  fprintf(err_, "%s\n", text.c_str());
-  fflush(err_);
-}
-
 void TerminalReport::HostError(const std::string& text) {
   progress_.Clear();
   fprintf(err_, "vxmigrate: %s\n", text.c_str());

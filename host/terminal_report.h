@@ -25,7 +25,6 @@ class TerminalReport : public vxRunListener {
   void ShowProgress(vxMigrationManager& manager);
 
   void OnLogEntry(const std::string& entry) override;
-  void OnUnloggedFailure(const std::string& text) override;
 
   // An error of the host's own (for example a log that could not be written), on standard error.
   void HostError(const std::string& text);

@@ -10,6 +10,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/settings_number.h"
 #include "migrate/manager.h"
 
@@ -168,9 +169,9 @@ int vxMigrationManager::MergeAdvancedOptionsFiles(const vxStringBase& sourceFile
     destination.SetVal("Default", countKey, number + 1);
   }
 
+  if (!vxWroteBack(*this, destination)) return 1;
   Log(kMigrated, sourceFile.c_str());
-  source.Close(0);
-  return destination.Close(1) == 0 ? 0 : 1;
+  return 0;
 }
 
 namespace {
@@ -233,16 +234,19 @@ int vxMigrationManager::DoOBXMergeAdvancedOptionsFiles() {
   vxFileManager::MakePath(destinationPath, m_destinationDirectory, kDynamicPages, 1);
   if (!vxFileManager::Exists(destinationPath)) {
     // Nothing to merge into: the old file travels whole, with its sample parameters.
-    source.Close(0);
-    vxFileManager::CopyFile(sourcePath, destinationPath, 0, 1, 0, 0, 0, nullptr, nullptr);
+    const int copied =
+        vxFileManager::CopyFile(sourcePath, destinationPath, 0, 1, 0, 0, 0, nullptr, nullptr);
     Log("INI file doesn't exist - file being copied: ", sourcePath.c_str());
+    if (!vxCopied(*this, copied, sourcePath, destinationPath)) return 1;
     vxStringBase sourceSample;
     vxStringBase destinationSample;
     vxFileManager::MakePath(sourceSample, m_sourceDirectory, kSampleParams, 1);
     vxFileManager::MakePath(destinationSample, m_destinationDirectory, kSampleParams, 1);
     if (vxFileManager::Exists(sourceSample) && !vxFileManager::Exists(destinationSample)) {
-      vxFileManager::CopyFile(sourceSample, destinationSample, 0, 1, 0, 0, 0, nullptr, nullptr);
+      const int copiedSample = vxFileManager::CopyFile(sourceSample, destinationSample, 0, 1, 0,
+                                                       0, 0, nullptr, nullptr);
       Log("TXT file doesn't exist - file being copied: ", sourceSample.c_str());
+      if (!vxCopied(*this, copiedSample, sourceSample, destinationSample)) return 1;
     }
     return 0;
   }
@@ -264,7 +268,7 @@ int vxMigrationManager::DoOBXMergeAdvancedOptionsFiles() {
     destination.SetVal("default", "queryprofilecount", number + 1);
   }
 
+  if (!vxWroteBack(*this, destination)) return 1;
   Log(kMigrated, kDynamicPages);
-  source.Close(0);
-  return destination.Close(1) == 0 ? 0 : 1;
+  return 0;
 }

@@ -196,7 +196,6 @@ void vxMigrationManager::MergeCategoriesINIFile(const char* profileFolder, const
   vxMappedINIFile destination(destinationPath);
   if (destination.Open(1) != 0 && vxFileManager::Exists(destinationPath)) {
     Log("Error: categories.ini cannot be read - not merged: ", destinationPath.c_str());
-    source.Close(0);
     return;
   }
   vxStringBase destinationFolder;
@@ -205,10 +204,9 @@ void vxMigrationManager::MergeCategoriesINIFile(const char* profileFolder, const
   CategoriesMerge(*this, source, destination, destinationFolder, vxStringBase(exclusionList),
                   keepNames)
       .Run();
-  source.Close(0);
   // The entries are worth keeping even when no profile came along to create the folder.
-  vxFileManager::CreateDirectory(destinationFolder, nullptr);
-  if (destination.Close(1) != 0) {
+  if (vxFileManager::CreateDirectory(destinationFolder, nullptr) != 0 ||
+      destination.Close(1) != 0) {
     Log("Error: categories.ini could not be written: ", destinationPath.c_str());
     return;
   }

@@ -142,7 +142,6 @@ int vxMigrationManager::DoCheckVersions(const vxStringBase& sourceSection,
   vxVersionDescriptor sourceHigh(ranges.GetVal(sourceSection, "High"));
   vxVersionDescriptor destinationLow(ranges.GetVal(destinationSection, "Low"));
   vxVersionDescriptor destinationHigh(ranges.GetVal(destinationSection, "High"));
-  ranges.Close(0);
 
   const vxVersionDescriptor& from = *m_sourceVersionDescriptor;
   const vxVersionDescriptor& to = *m_destinationVersionDescriptor;

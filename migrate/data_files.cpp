@@ -277,9 +277,7 @@ const size_t kMaxMergedSize = UINT32_MAX - 8;
 bool ReadWholeFile(const vxStringBase& path, unsigned int accessMode, vxStringBase& text) {
   vxBasicFile file(path, accessMode, accessMode, 0);
   if (file.Open() != 0) return false;
-  const bool read = file.ReadAll(text) == 0;
-  file.Close();
-  return read;
+  return file.ReadAll(text) == 0;
 }
 
 bool RewriteFile(const vxStringBase& path, const vxStringBase& text) {
@@ -302,15 +300,12 @@ int vxMigrationManager::DoMergeCSVFile(const char* sourceFile, const char* desti
   vxFileManager::MakePath(sourcePath, m_sourceDirectory, sourceFile, 1);
   vxFileManager::MakePath(destinationPath, m_destinationDirectory, destinationFile, 1);
 
-  // Failures leave the log as it has always been; the host still hears of each one.
+  // Every failure gets its error line, naming the side that failed.
   if (!vxFileManager::Exists(destinationPath)) {
     Log("TXT file doesn't exist - file being copied: ", sourcePath.c_str());
     const int copied =
         vxFileManager::CopyFile(sourcePath, destinationPath, 0, 1, 0, 0, 0, nullptr, nullptr);
-    if (copied != 0 && !vxIsAbsent(sourcePath)) {
-      const vxFailedCopy blame = vxBlameFailedCopy(sourcePath, destinationPath);
-      ReportUnloggedFailure(blame.text, blame.path->c_str());
-    }
+    vxCopied(*this, copied, sourcePath, destinationPath);
     return copied;
   }
 
@@ -319,11 +314,11 @@ int vxMigrationManager::DoMergeCSVFile(const char* sourceFile, const char* desti
   vxStringBase sourceText;
   vxStringBase destinationText;
   if (!ReadWholeFile(sourcePath, O_RDONLY, sourceText)) {
-    if (!vxIsAbsent(sourcePath)) ReportUnloggedFailure(vxMsgUnableToOpenFile, sourcePath.c_str());
+    if (!vxIsAbsent(sourcePath)) Log(vxMsgUnableToOpenFile, sourcePath.c_str());
     return 1;
   }
   if (!ReadWholeFile(destinationPath, O_RDWR, destinationText)) {
-    ReportUnloggedFailure(vxCanRead(destinationPath) ? vxMsgUnableToWriteFile : vxMsgUnableToOpenFile,
+    Log(vxCanRead(destinationPath) ? vxMsgUnableToWriteFile : vxMsgUnableToOpenFile,
                           destinationPath.c_str());
     return 1;
   }
@@ -341,7 +336,7 @@ int vxMigrationManager::DoMergeCSVFile(const char* sourceFile, const char* desti
     return 1;  // out of memory: the destination stays as it was
   }
   if (!RewriteFile(destinationPath, merged)) {
-    ReportUnloggedFailure(vxMsgUnableToWriteFile, destinationPath.c_str());
+    Log(vxMsgUnableToWriteFile, destinationPath.c_str());
     return 1;
   }
   Log("Data File Merged: ", destinationFile);

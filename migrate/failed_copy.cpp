@@ -9,6 +9,7 @@
 
 #include <cerrno>
 
+#include "foundation/inifile/ini_file.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 
@@ -38,4 +39,18 @@ void vxLogFailedCopy(vxMigrationManager& manager, const vxStringBase& source,
                      const vxStringBase& destination) {
   const vxFailedCopy blame = vxBlameFailedCopy(source, destination);
   manager.Log(blame.text, blame.path->c_str());
+}
+
+bool vxCopied(vxMigrationManager& manager, int copyResult, const vxStringBase& source,
+              const vxStringBase& destination) {
+  if (copyResult == 0) return true;
+  if (!vxIsAbsent(source)) vxLogFailedCopy(manager, source, destination);
+  return false;
+}
+
+bool vxWroteBack(vxMigrationManager& manager, vxMappedINIFile& file) {
+  const vxStringBase path(file.GetFilename());
+  if (file.Close(1) == 0) return true;
+  manager.Log(vxMsgUnableToWriteFile, path.c_str());
+  return false;
 }

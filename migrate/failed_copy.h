@@ -31,4 +31,14 @@ vxFailedCopy vxBlameFailedCopy(const vxStringBase& source, const vxStringBase& d
 void vxLogFailedCopy(vxMigrationManager& manager, const vxStringBase& source,
                      const vxStringBase& destination);
 
+// The copy's result as the caller's success: true when it copied. A failed copy gets its error
+// line; one whose source plainly does not exist gets none (there was nothing to carry over).
+bool vxCopied(vxMigrationManager& manager, int copyResult, const vxStringBase& source,
+              const vxStringBase& destination);
+
+class vxMappedINIFile;
+// Writes the settings file back (Close(1)); false, with the "Unable to write file" error line
+// naming it logged, when that failed. The caller logs its success line only on true.
+bool vxWroteBack(vxMigrationManager& manager, vxMappedINIFile& file);
+
 #endif  // VXMIGRATE_MIGRATE_FAILED_COPY_H_

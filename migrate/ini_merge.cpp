@@ -67,7 +67,6 @@ int vxMigrationManager::MergeINIFiles(const char* sourceFile, const char* destin
     return 1;
   }
   newSettings.MergeFrom(oldSettings, RecordMerge(source.Pathname(), destination.Pathname()));
-  oldSettings.Close(0);
   if (newSettings.Close(1) != 0) {
     Log(kUnableToOpen, destination.Pathname().c_str());
     return 1;

@@ -36,16 +36,16 @@ int vxMigrationManager::DoKeywordINIMerge() {
   vxFileManager::MakePath(sourcePath, m_sourceDirectory, "keywords.ini", 1);
   vxFileManager::MakePath(destinationPath, m_destinationDirectory, "keywords.ini", 1);
 
-  // Failures leave the log as it has always been; the host still hears of each one.
+  // Every failure gets its error line, naming the side that failed.
   vxMappedINIFile source(sourcePath);
   if (source.Open(0) != 0) {
-    if (!vxIsAbsent(sourcePath)) ReportUnloggedFailure(vxMsgUnableToOpenFile, sourcePath.c_str());
+    if (!vxIsAbsent(sourcePath)) Log(vxMsgUnableToOpenFile, sourcePath.c_str());
     return 1;
   }
   vxMappedINIFile destination(destinationPath);
   if (destination.Open(0) != 0) {
     if (!vxIsAbsent(destinationPath)) {
-      ReportUnloggedFailure(vxMsgUnableToOpenFile, destinationPath.c_str());
+      Log(vxMsgUnableToOpenFile, destinationPath.c_str());
     }
     return 1;
   }
@@ -73,9 +73,7 @@ int vxMigrationManager::DoKeywordINIMerge() {
     }
   }
 
+  if (!vxWroteBack(*this, destination)) return 1;
   Log("keywords.ini merged");
-  source.Close(0);
-  if (destination.Close(1) == 0) return 0;
-  ReportUnloggedFailure(vxMsgUnableToWriteFile, destinationPath.c_str());
-  return 1;
+  return 0;
 }

@@ -5,6 +5,7 @@
 // credential that cannot be protected, is logged and left exactly as copied. Results are always 0.
 
 #include <cstring>
+#include <filesystem>
 #include <string>
 #include <unordered_set>
 #include <vector>
@@ -12,8 +13,10 @@
 #include "crypt/protected_value.h"
 #include "foundation/files/file_info.h"
 #include "foundation/files/file_manager.h"
+#include "foundation/files/run_doors.h"
 #include "foundation/inifile/ini_file.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/marked_name.h"
 #include "migrate/internal/profile_migration.h"
 #include "migrate/manager.h"
@@ -34,6 +37,16 @@ const char* SelectionOption(const vxStringBase& extension) {
 bool IsProtected(const vxStringBase& value) {
   std::vector<char> text(value.c_str(), value.c_str() + value.length() + 1);
   return VXUI_IsOurTwoFish(text.data()) == 1;
+}
+
+// A data folder this step made and could not fill because the disk failed (every later write of
+// the run is refused then): taken away again, so that the next run, finding none, copies it
+// whole rather than leaving it half filled as one that "exists". Only what the step just made.
+void TakeBackHalfCopiedFolder(const vxStringBase& folder) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  if (doors == nullptr || doors->StoppedBy() == 0) return;
+  std::error_code ignored;
+  std::filesystem::remove_all(folder.str(), ignored);
 }
 
 // Copies the data folders ("<profile>.dat") of the profiles that were not left behind, under their
@@ -66,11 +79,18 @@ void CopyDataFolders(vxMigrationManager& manager, const vxStringBase& folder,
       manager.Log("Folder exists - no copy made: ", destination.c_str());
       continue;
     }
-    vxFileManager::CreateDirectory(destination, nullptr);
     vxStringBase source;
     vxFileManager::MakePath(source, sourceFolder, dataFolder, 0);
-    vxFileManager::CopyFile(source, destination, 1, 1, 0, 0, 0, nullptr, nullptr);
-    manager.Log("Folder copied:  ", destination.c_str());
+    // Made even when the source folder is empty: the profile looks for it.
+    const int copied = vxFileManager::CreateDirectory(destination, nullptr) != 0
+                           ? 1
+                           : vxFileManager::CopyFile(source, destination, 1, 1, 0, 0, 0, nullptr,
+                                                     nullptr);
+    if (vxCopied(manager, copied, source, destination)) {
+      manager.Log("Folder copied:  ", destination.c_str());
+    } else {
+      TakeBackHalfCopiedFolder(destination);
+    }
   }
 }
 
@@ -113,7 +133,6 @@ void RewriteProfileSettings(vxMigrationManager& manager, const vxStringBase& pat
   std::string declined;
   if (!ConvertLogProfile(manager, profile, declined)) {
     manager.Log(declined.c_str(), path.c_str());
-    profile.Close(0);
     return;
   }
   int written = flush ? profile.CloseFW(1) : profile.Close(1);

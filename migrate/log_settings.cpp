@@ -4,6 +4,7 @@
 
 #include "foundation/files/file_manager.h"
 #include "foundation/inifile/ini_file.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/settings_number.h"
 #include "migrate/manager.h"
 
@@ -83,10 +84,11 @@ int vxMigrationManager::DoVXMLogINIChange() {
   if (NeedsCookieConversion(m_sourceProductID, m_sourceVersionDescriptor, m_destinationProductID,
                             m_destinationVersionDescriptor) &&
       ConvertCookie(settings)) {
+    if (!vxWroteBack(*this, settings)) return 1;
     Log("New-style cookie created in vxm_log.ini");
+    return 0;
   }
-  settings.Close(1);
-  return 0;
+  return vxWroteBack(*this, settings) ? 0 : 1;
 }
 
 int vxMigrationManager::DoTableLimitINIChange() {
@@ -98,6 +100,5 @@ int vxMigrationManager::DoTableLimitINIChange() {
   if (settings.GetVal("MaxTableSizes", "TopCompanies").isEmpty()) {
     settings.SetVal("MaxTableSizes", "TopCompanies", limit);
   }
-  settings.Close(1);
-  return 0;
+  return vxWroteBack(*this, settings) ? 0 : 1;
 }

@@ -16,6 +16,7 @@
 #include "foundation/files/filename.h"
 #include "foundation/files/folder_lock.h"
 #include "foundation/files/run_doors.h"
+#include "foundation/files/run_journal.h"
 #include "foundation/files/shared_lib.h"
 #include "foundation/files/atomic_file.h"
 #include "foundation/inifile/ini_file.h"
@@ -89,7 +90,8 @@ void vxMigrationManager::Start(int argc, char** argv) {
 }
 
 vxMigrationManager::~vxMigrationManager() {
-  if (m_record != nullptr && !m_finished) FinishRun(m_result);
+  // Nobody is left to hear the result; a failure is in the log.
+  if (m_record != nullptr && !m_finished) static_cast<void>(FinishRun(m_result));
   delete m_log;
   m_doors.reset();
   delete m_sourceVersionDescriptor;
@@ -123,14 +125,14 @@ void vxMigrationManager::NoteEntry(const std::string& entry) {
   if (m_listener != nullptr) m_listener->OnLogEntry(entry);
 }
 
-void vxMigrationManager::ReportUnloggedFailure(const char* text, const char* value) {
-  ++m_counts.errors;
-  if (m_listener != nullptr) m_listener->OnUnloggedFailure(vxLogFile::EntryText(text, value));
-}
-
 void vxMigrationManager::SetRunListener(vxRunListener* listener) {
   m_listener = listener;
-  if (listener != nullptr && m_log != nullptr) WriteHeader(listener);
+  if (listener == nullptr || m_log == nullptr) return;
+  WriteHeader(listener);
+  // Logged right after the header, before any listener could be there.
+  if (LacksJournal() && m_log->IsOpen()) {
+    listener->OnLogEntry(vxLogFile::EntryText(kNoJournal, m_destinationDirectory.c_str()));
+  }
 }
 
 // The command file fills in what the command line lacks: its "main" keys overwrite the options of
@@ -171,7 +173,6 @@ void vxMigrationManager::ReadCommandFile() {
   for (const auto& key : kProfileKeys) {
     m_cmdLineParser->SetValue(key[1], commandFile.GetVal("profiles", key[0]));
   }
-  commandFile.Close(0);
   m_cmdLineParser->Validate();
 }
 
@@ -197,11 +198,15 @@ void vxMigrationManager::OpenDoorsAndLog() {
   vxFileManager::MakePath(path, m_destinationDirectory, vxStringBase::NullStr, kLogFileName);
   m_log = new vxLogFile(path, 1);
   WriteHeader(nullptr);
-  if (m_settings.keepJournal && m_record != nullptr && m_record->Journal() == nullptr &&
-      m_log->IsOpen()) {
-    Log("** No undo journal could be kept; this run cannot be undone: ",
-        m_destinationDirectory.c_str());
-  }
+  if (LacksJournal() && m_log->IsOpen()) Log(kNoJournal, m_destinationDirectory.c_str());
+}
+
+// The run still migrates (its files are as good), but a promise is broken: an error.
+const char vxMigrationManager::kNoJournal[] =
+    "Error: No undo journal could be kept; this run cannot be undone: ";
+
+bool vxMigrationManager::LacksJournal() const {
+  return m_settings.keepJournal && m_record != nullptr && m_record->Journal() == nullptr;
 }
 
 vxIniMergeObserver* vxMigrationManager::RecordMerge(const vxStringBase& source,
@@ -225,9 +230,10 @@ std::string vxMigrationManager::GetRunId() const {
 }
 
 // The report goes through the doors like any other write (so undo takes it back too), atomically.
-void vxMigrationManager::FinishRun(int status) {
-  if (m_record == nullptr || m_finished) return;
+int vxMigrationManager::FinishRun(int status) {
+  if (m_record == nullptr || m_finished) return 0;
   m_finished = true;
+  int result = 0;
   const std::string path = GetReportPath();
   if (!path.empty() && m_log != nullptr && m_log->IsOpen()) {
     const std::string text = m_record->ReportText(m_pluginSearch.ran);
@@ -236,9 +242,16 @@ void vxMigrationManager::FinishRun(int status) {
     if (!vxfiles::ResolveReplaceTarget(path, &target) || !writer.Begin(target) ||
         !writer.Append(text) || !writer.Commit(true)) {
       Log("Error: Unable to write file:   ", path.c_str());
+      result = 1;
     }
   }
-  if (m_record->Journal() != nullptr) m_record->Journal()->Finish(status);
+  vxRunJournal* journal = m_record->Journal();
+  if (journal != nullptr && !journal->Finish(status)) {
+    Log("Error: Unable to write file:   ",
+        (journal->Folder() + "/" + kRunJournalFile).c_str());
+    result = 1;
+  }
+  return result;
 }
 
 // The header's nine entries: into the log (listener null), or told to a listener that arrives

@@ -86,9 +86,6 @@ class VXM_EXPORT vxMigrationManager {
   void Log(const char* text);
   // text immediately followed by value, as one entry.
   void Log(const char* text, const char* value);
-  // A failed step whose log text is fixed to say nothing: counted as an error and told to the
-  // listener, never written to the log. text is followed directly by value (a file's path).
-  void ReportUnloggedFailure(const char* text, const char* value);
 
   // The host's view of the run. The listener is told the entries already written (the header)
   // at once, then each entry as it is logged; it is not owned and must outlive the run.
@@ -102,8 +99,9 @@ class VXM_EXPORT vxMigrationManager {
   // the run keeps no report.
   vxIniMergeObserver* RecordMerge(const vxStringBase& source, const vxStringBase& destination);
   // Writes the report and closes the journal with the run's final status. Called once; the
-  // destructor calls it with DoMigration's result when the host did not.
-  void FinishRun(int status);
+  // destructor calls it with DoMigration's result when the host did not. 0 when both were
+  // written (or the run keeps neither); 1 when either could not be, which is logged.
+  [[nodiscard]] int FinishRun(int status);
   // The report's path ("" when the run keeps none) and the journal's run id ("" when none).
   std::string GetReportPath() const;
   std::string GetRunId() const;
@@ -218,6 +216,9 @@ class VXM_EXPORT vxMigrationManager {
   void ReadCommandFile();
   void FindExecutable();
   void OpenDoorsAndLog();
+  // The run was asked to keep an undo journal and could not start one.
+  bool LacksJournal() const;
+  static const char kNoJournal[];
   void WriteHeader(vxRunListener* listener);
   void NoteEntry(const std::string& entry);
   void RunPlugins(bool& found);

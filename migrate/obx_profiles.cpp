@@ -30,21 +30,40 @@ bool IsInstallationProfileFolder(const vxStringBase& folder) {
   return folder.at(0) == '.' && (folder.at(1) == '/' || folder.at(2) == '\\');
 }
 
-// The folders that carry one profile's data, copied beside its copy.
-void CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
-                             const vxStringBase& newBase, const vxStringBase& newName) {
-  vxStringBase reportsFrom, reportsTo;
+// One of a profile's data folders, copied into the destination before the profile itself: the
+// profile's copy marks the profile as done (a re-run skips it), so it must come last.
+struct DataFolderCopy {
+  vxStringBase from, to;
+  int result = 1;
+};
+
+DataFolderCopy CopyDataFolder(const vxStringBase& from, const vxStringBase& to) {
+  return DataFolderCopy{from, to, vxFileManager::CopyFile(from, to, 1, 1, 0, 0, 0, nullptr, nullptr)};
+}
+
+// Logs a data folder's copy after its profile's. A profile without such a folder has nothing to
+// carry and counts as copied, as it always has; a copy that failed is logged as the error.
+void LogDataFolder(vxMigrationManager& manager, const DataFolderCopy& copy, const char* done) {
+  if (vxCopied(manager, copy.result, copy.from, copy.to) || vxIsAbsent(copy.from)) {
+    manager.Log(done, copy.to.c_str());
+  }
+}
+
+// The folders that carry one profile's data: reports, then databases.
+struct ProfileData {
+  DataFolderCopy reports, databases;
+};
+
+ProfileData CopyProfileData(vxMigrationManager& manager, const vxFilename& profile,
+                            const vxStringBase& newBase, const vxStringBase& newName) {
+  vxStringBase reportsFrom, reportsTo, databaseFrom, databaseTo;
   vxFileManager::MakePath(reportsFrom, manager.GetSourceDirectory(), kReports, profile.Filename());
   vxFileManager::MakePath(reportsTo, manager.GetDestinationDirectory(), kReports, newName);
-  vxFileManager::CopyFile(reportsFrom, reportsTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-  manager.Log("Report folder copied: ", reportsTo.c_str());
-
-  vxStringBase databaseFrom, databaseTo;
   vxFileManager::MakePath(databaseFrom, manager.GetSourceDirectory(), kDatabases,
                           profile.BaseName());
   vxFileManager::MakePath(databaseTo, manager.GetDestinationDirectory(), kDatabases, newBase);
-  vxFileManager::CopyFile(databaseFrom, databaseTo, 1, 1, 0, 0, 0, nullptr, nullptr);
-  manager.Log("Database folder copied: ", databaseTo.c_str());
+  return ProfileData{CopyDataFolder(reportsFrom, reportsTo),
+                     CopyDataFolder(databaseFrom, databaseTo)};
 }
 
 // A profile without its report folders creates its reports on demand unless it says otherwise;
@@ -104,6 +123,9 @@ int vxMigrationManager::DoCopyOBXProfiles() {
 
     vxStringBase from;
     vxFileManager::MakePath(from, sourceProfiles, vxStringBase::NullStr, name);
+    // Only a profile that can be carried brings its folders along.
+    ProfileData data;
+    if (copyData && vxCanRead(from)) data = CopyProfileData(*this, file, newBase, newName);
     // Converted on its way and written once: a kill never leaves a copy without its default.
     const vxConvertedCopy outcome = WriteConvertedCopy(from, target, [copyData](vxMappedINIFile& p) {
       return DefaultToReportsOnDemand(p, copyData);
@@ -114,7 +136,10 @@ int vxMigrationManager::DoCopyOBXProfiles() {
       continue;
     }
     Log("Profile copied: ", target.c_str());
-    if (copyData) CopyProfileData(*this, file, newBase, newName);
+    if (copyData) {
+      LogDataFolder(*this, data.reports, "Report folder copied: ");
+      LogDataFolder(*this, data.databases, "Database folder copied: ");
+    }
   }
   return 0;
 }

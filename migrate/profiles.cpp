@@ -11,6 +11,7 @@
 #include "foundation/files/filename.h"
 #include "foundation/string/tokenizer.h"
 #include "migrate/exclusion_index.h"
+#include "migrate/failed_copy.h"
 #include "migrate/internal/source_tree.h"
 #include "migrate/manager.h"
 
@@ -26,11 +27,18 @@ void CopyProfileDataFolder(vxMigrationManager& manager, const vxStringBase& sour
   if (vxFilename::IsDirectory(sourceData.c_str()) == 0) return;
   vxStringBase destinationData;
   vxFileManager::MakePath(destinationData, destinationFolder, dataName, 0);
-  vxFileManager::CreateDirectory(destinationData, nullptr);
   vxStringBase sourcePattern(sourceData);
   sourcePattern.append("*.*");
   // The profile itself was new to the destination, so its data folder's files go in as they are.
-  vxFileManager::CopyFile(sourcePattern, destinationData, 1, 1, 0, 0, 0, nullptr, nullptr);
+  // The folder is made even when it gets no file: the profile looks for it.
+  const int copied = vxFileManager::CreateDirectory(destinationData, nullptr) != 0
+                         ? 1
+                         : vxFileManager::CopyFile(sourcePattern, destinationData, 1, 1, 0, 0, 0,
+                                                   nullptr, nullptr);
+  if (copied != 0) {
+    vxLogFailedCopy(manager, sourceData, destinationData);
+    return;
+  }
   manager.Log("Folder copied:  ", sourcePattern.c_str());
 }
 

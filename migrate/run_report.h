@@ -40,8 +40,6 @@ class vxRunListener {
   virtual ~vxRunListener() = default;
   // entry: the text as written, without its time stamp.
   virtual void OnLogEntry(const std::string& entry) = 0;
-  // A step failed where its log text is fixed to say nothing; text names the file.
-  virtual void OnUnloggedFailure(const std::string& text) = 0;
 };
 
 #endif  // VXMIGRATE_MIGRATE_RUN_REPORT_H_

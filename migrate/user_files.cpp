@@ -73,8 +73,12 @@ void vxMigrationManager::CopyMarkedFiles(
       continue;
     }
     if (convert == nullptr) {
-      // Logged as copied whatever the copy answered: the later steps look at what is there.
-      vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
+      const int copied =
+          vxFileManager::CopyFile(source, destination, 0, 1, 0, 0, 0, nullptr, nullptr);
+      if (copied != 0) {
+        vxLogFailedCopy(*this, source, destination);
+        continue;
+      }
       Log("File copied:  ", destination.c_str());
       if (made != nullptr) made->push_back(destination);
       continue;

@@ -59,6 +59,14 @@ void AtomicFileWriter::Abandon() {
   dirFd_ = -1;
 }
 
+bool AtomicFileWriter::Fail() {
+  const int error = errno;
+  Abandon();
+  NoteWriteFailure(error, target_.path);
+  failed_ = true;
+  return false;
+}
+
 bool AtomicFileWriter::Begin(const ReplaceTarget& target, bool makeFolder) {
   Abandon();
   target_ = target;
@@ -73,20 +81,16 @@ bool AtomicFileWriter::Begin(const ReplaceTarget& target, bool makeFolder) {
       vxFileManager::CreateDirectory(vxStringBase(folder.c_str()), nullptr) == 0) {
     dirFd_ = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
   }
-  if (dirFd_ < 0) return false;
+  if (dirFd_ < 0) return Fail();
   // 0600 until complete: nobody else reads a file that is still being written.
   fd_ = CreateTempFileAt(dirFd_, name_.c_str(), 0600, tempName_);
-  if (fd_ < 0) {
-    Abandon();
-    return false;
-  }
+  if (fd_ < 0) return Fail();
   return true;
 }
 
 bool AtomicFileWriter::Append(std::string_view data) {
   if (failed_ || fd_ < 0) return false;
-  if (!vxWriteAll(fd_, data.data(), data.size())) failed_ = true;
-  return !failed_;
+  return vxWriteAll(fd_, data.data(), data.size()) || Fail();
 }
 
 bool AtomicFileWriter::Commit(bool flushToDisk, bool replace) {
@@ -101,15 +105,19 @@ bool AtomicFileWriter::Commit(bool flushToDisk, bool replace) {
   ok = (close(fd_) == 0) && ok;
   fd_ = -1;
   if (!ok || CommitTempAt(dirFd_, tempName_.c_str(), name_.c_str(), replace) != 0) {
-    const int error = errno;
-    Abandon();
-    errno = error;
-    return false;
+    // A target that appeared meanwhile is kept, which the caller hears as EEXIST: no failure of
+    // the disk.
+    if (errno == EEXIST && !replace) {
+      Abandon();
+      errno = EEXIST;
+      return false;
+    }
+    return Fail();
   }
   tempName_.clear();
-  ok = !flushToDisk || fsync(dirFd_) == 0;
+  if (flushToDisk && fsync(dirFd_) != 0) return Fail();
   Abandon();  // closes the folder
-  return ok;
+  return true;
 }
 
 bool SyncFileSystemOf(const std::string& folder) {

@@ -48,16 +48,18 @@ class AtomicFileWriter {
   // Creates the temporary file in the target's folder; with makeFolder, a missing folder (and its
   // missing parents) is made first. False on failure (the door refused, the folder is missing or
   // not writable).
-  bool Begin(const ReplaceTarget& target, bool makeFolder = false);
+  [[nodiscard]] bool Begin(const ReplaceTarget& target, bool makeFolder = false);
   // Writes data to the temporary file (callers buffer); false once any write has failed.
-  bool Append(std::string_view data);
+  [[nodiscard]] bool Append(std::string_view data);
   // Gives the file the target's mode (and owner, where allowed), with flushToDisk syncs it, and
   // renames it onto the target: replacing what is there with replace, else failing with errno
   // EEXIST when the target exists. With flushToDisk the folder is synced too.
-  bool Commit(bool flushToDisk, bool replace = true);
+  [[nodiscard]] bool Commit(bool flushToDisk, bool replace = true);
 
  private:
   void Abandon();
+  // Abandons the write after a failed call (errno), which the run's doors are told of; false.
+  bool Fail();
 
   ReplaceTarget target_;
   std::string name_;      // the target's name within its folder

@@ -44,14 +44,23 @@ int OpenRewrite(const std::string& name, int flags, mode_t permissions, std::str
   std::string temp;
   int fd = vxfiles::CreateTempFileAt(dirFd, base.c_str(), exists ? 0600 : permissions, temp);
   close(dirFd);
-  if (fd < 0) return -1;
+  if (fd < 0) {
+    vxfiles::NoteWriteFailure(errno, name);
+    return -1;
+  }
   tempName = folder + "/" + temp;
   if (exists) {
     // Owner first: a change of owner clears the set-id bits that the mode then restores.
     if (fchown(fd, st.st_uid, st.st_gid) != 0) {
       // Only root may give a file away; anyone else keeps the file as their own.
     }
-    fchmod(fd, st.st_mode & 07777);
+    if (fchmod(fd, st.st_mode & 07777) != 0) {
+      vxfiles::NoteWriteFailure(errno, name);
+      close(fd);
+      unlink(tempName.c_str());
+      tempName.clear();
+      return -1;
+    }
   }
   return fd;
 }
@@ -118,6 +127,7 @@ int vxBasicFile::Write(const vxStringBase& text, unsigned long& written) {
   if (fd_ < 0) return 1;
   if (!vxWriteAll(fd_, text.c_str(), text.length())) {
     writeFailed_ = true;  // a rewrite that missed bytes must not replace the old file
+    vxfiles::NoteWriteFailure(errno, name_);
     return 1;
   }
   written = text.length();
@@ -126,13 +136,16 @@ int vxBasicFile::Write(const vxStringBase& text, unsigned long& written) {
 
 int vxBasicFile::Close() {
   if (fd_ < 0) return 0;
-  bool ok = close(fd_) == 0 && !writeFailed_;
+  const bool closed = close(fd_) == 0;
+  if (!closed) vxfiles::NoteWriteFailure(errno, name_);
+  const bool ok = closed && !writeFailed_;
   fd_ = -1;
   if (tempName_.empty()) return ok ? 0 : 1;
   if (ok && rename(tempName_.c_str(), name_.c_str()) == 0) {
     tempName_.clear();
     return 0;
   }
+  if (ok) vxfiles::NoteWriteFailure(errno, name_);
   unlink(tempName_.c_str());
   tempName_.clear();
   return 1;

@@ -27,9 +27,9 @@ class VXM_EXPORT vxBasicFile {
   // Reads the whole content into text. 0 on success.
   int ReadAll(vxStringBase& text);
   // Appends text at the current position; written is set to the bytes written. 0 on success.
-  int Write(const vxStringBase& text, unsigned long& written);
+  [[nodiscard]] int Write(const vxStringBase& text, unsigned long& written);
   // Closes; a pending rewrite is flushed and renamed into place. 0 on success.
-  int Close();
+  [[nodiscard]] int Close();
 
  private:
   std::string name_;

@@ -23,11 +23,13 @@
 #include "foundation/files/dir_entries.h"
 #include "foundation/files/run_doors.h"
 #include "foundation/files/temp_file.h"
+#include "foundation/files/unique_fd.h"
 #include "foundation/files/write_all.h"
 
 namespace {
 
 using vxfiles::FolderId;
+using vxfiles::UniqueFd;
 
 // Deeper trees are refused: no installation comes near it, and each level holds two descriptors.
 const int kMaxTreeDepth = 256;
@@ -61,13 +63,10 @@ struct CopyJob {
 
 // A source entry ready to be written out: an open regular file, or a link's target text.
 struct Source {
-  int fd = -1;
+  UniqueFd fd;
   bool isLink = false;
   struct stat st;
   std::string linkTarget;
-  ~Source() {
-    if (fd >= 0) close(fd);
-  }
 };
 
 bool Newer(const struct timespec& a, const struct timespec& b) {
@@ -91,9 +90,9 @@ bool ReadLinkAt(int dirFd, const char* name, size_t sizeHint, std::string& targe
 // Opens the entry name of the folder dirFd (AT_FDCWD with a path for a single file) for copying.
 // kCopied means src is ready.
 Outcome OpenSource(int dirFd, const char* name, Source& src) {
-  src.fd = openat(dirFd, name, kOpenSource);
-  if (src.fd >= 0) {
-    if (fstat(src.fd, &src.st) != 0) return Outcome::kFailed;
+  src.fd.Reset(openat(dirFd, name, kOpenSource));
+  if (src.fd.valid()) {
+    if (fstat(src.fd.get(), &src.st) != 0) return Outcome::kFailed;
     if (S_ISREG(src.st.st_mode)) return Outcome::kCopied;
     return S_ISDIR(src.st.st_mode) ? Outcome::kFailed : Outcome::kSkipped;
   }
@@ -121,12 +120,24 @@ Outcome CheckDestination(const CopyJob& job, int dstDirFd, const char* name, con
   return Newer(src.st.st_mtim, dst.st_mtim) ? Outcome::kCopied : Outcome::kLeftInPlace;
 }
 
+// Whether setting a mode or times worked, or failed only because the destination's file system
+// cannot hold them (a copy onto such a disk keeps its content all the same).
+bool KeptOrUnsupported(int result) {
+  return result == 0 || errno == EPERM || errno == ENOTSUP || errno == EOPNOTSUPP;
+}
+
 // A folder the copy created takes its source's mode and times once it is filled (filling it would
-// change its times again).
-void StampFolder(int fd, const struct stat& source) {
+// change its times again). False when the disk failed to take them.
+bool StampFolder(int fd, const struct stat& source) {
   const struct timespec times[2] = {source.st_atim, source.st_mtim};
-  fchmod(fd, source.st_mode & 07777);
-  futimens(fd, times);
+  return KeptOrUnsupported(fchmod(fd, source.st_mode & 07777)) &&
+         KeptOrUnsupported(futimens(fd, times));
+}
+
+// Records a failed write of the copy (errno) on path: the copy fails, and the run's doors hear it.
+void NoteFailure(CopyJob& job, const std::string& path) {
+  job.failed = true;
+  vxfiles::NoteWriteFailure(errno, path);
 }
 
 // Copies the content of in to out, both at their current offsets. The kernel copy serves the
@@ -159,7 +170,7 @@ bool CopyBytes(CopyJob& job, int in, int out, off_t size) {
 }
 
 // Writes the temporary entry for src; mode and times are kept where the file system can hold
-// them (a failure there does not fail the copy, the content does).
+// them (only a disk that fails to take them fails the copy).
 bool WriteTemp(CopyJob& job, const Source& src, int dstDirFd, const char* name,
                std::string& temp) {
   const struct timespec times[2] = {src.st.st_atim, src.st.st_mtim};
@@ -167,19 +178,15 @@ bool WriteTemp(CopyJob& job, const Source& src, int dstDirFd, const char* name,
     if (vxfiles::CreateTempLinkAt(dstDirFd, name, src.linkTarget.c_str(), temp) != 0) {
       return false;
     }
-    utimensat(dstDirFd, temp.c_str(), times, AT_SYMLINK_NOFOLLOW);
-    return true;
+    return KeptOrUnsupported(utimensat(dstDirFd, temp.c_str(), times, AT_SYMLINK_NOFOLLOW));
   }
   // 0600 until complete: nobody else reads a file that is still being written.
-  int out = vxfiles::CreateTempFileAt(dstDirFd, name, 0600, temp);
-  if (out < 0) return false;
-  bool ok = CopyBytes(job, src.fd, out, src.st.st_size);
-  if (ok) {
-    fchmod(out, src.st.st_mode & 07777);
-    futimens(out, times);
-  }
-  if (close(out) != 0) ok = false;
-  return ok;
+  UniqueFd out(vxfiles::CreateTempFileAt(dstDirFd, name, 0600, temp));
+  if (!out.valid()) return false;
+  const bool ok = CopyBytes(job, src.fd.get(), out.get(), src.st.st_size) &&
+                  KeptOrUnsupported(fchmod(out.get(), src.st.st_mode & 07777)) &&
+                  KeptOrUnsupported(futimens(out.get(), times));
+  return out.Close() && ok;
 }
 
 Outcome WriteDestination(CopyJob& job, const Source& src, int dstDirFd, const char* name,
@@ -196,6 +203,7 @@ Outcome WriteDestination(CopyJob& job, const Source& src, int dstDirFd, const ch
   if (!temp.empty()) unlinkat(dstDirFd, temp.c_str(), 0);
   // Created by someone else since the check: theirs stays.
   if (written && error == EEXIST && !job.replace) return Outcome::kLeftInPlace;
+  vxfiles::NoteWriteFailure(error, job.destPath.empty() ? name : job.destPath + "/" + name);
   return Outcome::kFailed;
 }
 
@@ -218,10 +226,9 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
     job.failed = true;
     return;
   }
-  int srcFd = openat(srcParent, name, kOpenFolder | O_NOFOLLOW);
+  UniqueFd srcFd(openat(srcParent, name, kOpenFolder | O_NOFOLLOW));
   struct stat st;
-  if (srcFd < 0 || fstat(srcFd, &st) != 0) {
-    if (srcFd >= 0) close(srcFd);
+  if (!srcFd.valid() || fstat(srcFd.get(), &st) != 0) {
     job.failed = true;
     return;
   }
@@ -231,35 +238,31 @@ void CopySubFolder(CopyJob& job, int srcParent, const char* name, int dstParent,
   bool loop = (job.hasDestRoot && id == job.destRoot) ||
               std::find(job.openFolders.begin(), job.openFolders.end(), id) !=
                   job.openFolders.end();
-  if (loop) {
-    close(srcFd);
-    return;
-  }
+  if (loop) return;
   const size_t parentPathSize = job.destPath.size();
   job.destPath.append("/").append(name);
   // Made private while it fills (a read-only source folder must not lock us out of its copy);
   // its own mode and times follow once it is complete.
   bool fresh = vxfiles::MayWriteAt(dstParent, name) && mkdirat(dstParent, name, 0700) == 0;
-  int dstFd = (fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder | O_NOFOLLOW) : -1;
+  if (!fresh && errno != EEXIST) vxfiles::NoteWriteFailure(errno, job.destPath);
+  UniqueFd dstFd((fresh || errno == EEXIST) ? openat(dstParent, name, kOpenFolder | O_NOFOLLOW)
+                                            : -1);
   // An existing destination folder that is a link is written through only when it leads to a
   // folder inside the destination installation.
-  if (dstFd < 0 && errno == ELOOP && vxfiles::MayWriteInto(job.destPath)) {
-    dstFd = openat(dstParent, name, kOpenFolder);
+  if (!dstFd.valid() && errno == ELOOP && vxfiles::MayWriteInto(job.destPath)) {
+    dstFd.Reset(openat(dstParent, name, kOpenFolder));
   }
-  if (dstFd < 0) {
+  if (!dstFd.valid()) {
     job.destPath.resize(parentPathSize);
-    close(srcFd);
     job.failed = true;
     return;
   }
-  if (!fresh) vxfiles::RemoveStaleTempsAt(dstFd);  // what a killed run left here
+  if (!fresh) vxfiles::RemoveStaleTempsAt(dstFd.get());  // what a killed run left here
   job.openFolders.push_back(id);
-  CopyFolderContents(job, srcFd, dstFd, fresh, depth);
+  CopyFolderContents(job, srcFd.get(), dstFd.get(), fresh, depth);
   job.openFolders.pop_back();
+  if (fresh && !StampFolder(dstFd.get(), st)) NoteFailure(job, job.destPath);
   job.destPath.resize(parentPathSize);
-  if (fresh) StampFolder(dstFd, st);
-  close(dstFd);
-  close(srcFd);
 }
 
 void CopyFolderContents(CopyJob& job, int srcFd, int dstFd, bool destFresh, int depth) {
@@ -289,19 +292,21 @@ std::string TrimFolder(const std::string& path) {
 
 // Opens the destination folder, creating it and its parents when missing. fresh tells whether
 // this call made the folder itself.
-int OpenDestinationFolder(const std::string& path, bool& fresh) {
+UniqueFd OpenDestinationFolder(const std::string& path, bool& fresh) {
   fresh = false;
-  if (!vxfiles::MayWriteInto(path)) return -1;
+  if (!vxfiles::MayWriteInto(path)) return UniqueFd();
   std::string folder = TrimFolder(path);
   // Opened first: a run copying thousands of files into one folder makes it once, never asks
   // mkdir again.
-  int fd = open(folder.c_str(), kOpenFolder);
-  if (fd >= 0 || errno != ENOENT) return fd;
+  UniqueFd fd(open(folder.c_str(), kOpenFolder));
+  if (fd.valid() || errno != ENOENT) return fd;
   fresh = mkdir(folder.c_str(), 0777) == 0;
   if (!fresh && errno == ENOENT) {
     fresh = vxFileManager::CreateDirectory(vxStringBase(std::string_view(folder)), nullptr) == 0;
+  } else if (!fresh && errno != EEXIST) {
+    vxfiles::NoteWriteFailure(errno, folder);
   }
-  return open(folder.c_str(), kOpenFolder);
+  return UniqueFd(open(folder.c_str(), kOpenFolder));
 }
 
 FolderId IdOf(int fd) {
@@ -319,10 +324,9 @@ int CopySingleFile(CopyJob& job, const std::string& from, const std::string& to)
   Source src;
   if (OpenSource(AT_FDCWD, from.c_str(), src) != Outcome::kCopied) return 1;
   bool fresh;
-  int dstFd = OpenDestinationFolder(parent, fresh);
-  if (dstFd < 0) return 1;
-  Outcome outcome = WriteDestination(job, src, dstFd, name.c_str(), false);
-  close(dstFd);
+  UniqueFd dstFd = OpenDestinationFolder(parent, fresh);
+  if (!dstFd.valid()) return 1;
+  Outcome outcome = WriteDestination(job, src, dstFd.get(), name.c_str(), false);
   // Callers report "copied" on 0: a destination that was kept was not copied.
   return outcome == Outcome::kCopied ? 0 : 1;
 }
@@ -331,36 +335,32 @@ int CopySingleFile(CopyJob& job, const std::string& from, const std::string& to)
 int CopyMatchingFiles(CopyJob& job, const std::string& folder, const std::string& pattern,
                       const std::string& to) {
   if (!vxfiles::MayRead(folder)) return 1;
-  int srcFd = open(folder.c_str(), kOpenFolder);
-  if (srcFd < 0) return 1;
+  UniqueFd srcFd(open(folder.c_str(), kOpenFolder));
+  if (!srcFd.valid()) return 1;
   std::vector<vxfiles::DirEntry> entries;
-  if (!vxfiles::ReadDirEntries(srcFd, entries, job.dirBuffer)) job.failed = true;
-  int dstFd = -1;
+  if (!vxfiles::ReadDirEntries(srcFd.get(), entries, job.dirBuffer)) job.failed = true;
+  UniqueFd dstFd;
   for (const vxfiles::DirEntry& entry : entries) {
     if (!vxfiles::NameMatches(pattern.c_str(), entry.name.c_str())) continue;
-    unsigned char type = vxfiles::ResolveType(srcFd, entry);
+    unsigned char type = vxfiles::ResolveType(srcFd.get(), entry);
     if (type != DT_REG && type != DT_LNK) continue;
-    if (dstFd < 0) {  // made only when there is something to put in it
+    if (!dstFd.valid()) {  // made only when there is something to put in it
       bool fresh;
       dstFd = OpenDestinationFolder(to, fresh);
-      if (dstFd < 0) {
-        close(srcFd);
-        return 1;
-      }
-      if (IdOf(dstFd) == IdOf(srcFd)) break;  // the files are already where they should go
+      if (!dstFd.valid()) return 1;
+      // The files are already where they should go.
+      if (IdOf(dstFd.get()) == IdOf(srcFd.get())) break;
     }
-    Record(job, CopyEntry(job, srcFd, entry.name.c_str(), dstFd, false));
+    Record(job, CopyEntry(job, srcFd.get(), entry.name.c_str(), dstFd.get(), false));
   }
-  if (dstFd >= 0) close(dstFd);
-  close(srcFd);
   return job.failed ? 1 : 0;
 }
 
 // tree 1: a folder's whole tree, a "folder/pattern" set, or a single file, into the folder to.
 int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to) {
   if (!vxfiles::MayRead(from)) return 1;
-  int srcFd = open(from.c_str(), kOpenFolder);
-  if (srcFd < 0) {
+  UniqueFd srcFd(open(from.c_str(), kOpenFolder));
+  if (!srcFd.valid()) {
     int error = errno;
     std::string folder, last;
     vxfiles::SplitPath(from, folder, last);
@@ -372,30 +372,24 @@ int CopyIntoFolder(CopyJob& job, const std::string& from, const std::string& to)
     Outcome opened = OpenSource(AT_FDCWD, from.c_str(), src);
     if (opened != Outcome::kCopied) return opened == Outcome::kSkipped ? 0 : 1;
     bool fresh;
-    int dstFd = OpenDestinationFolder(to, fresh);
-    if (dstFd < 0) return 1;
-    Outcome outcome = WriteDestination(job, src, dstFd, last.c_str(), fresh);
-    close(dstFd);
+    UniqueFd dstFd = OpenDestinationFolder(to, fresh);
+    if (!dstFd.valid()) return 1;
+    Outcome outcome = WriteDestination(job, src, dstFd.get(), last.c_str(), fresh);
     return outcome == Outcome::kFailed ? 1 : 0;
   }
   struct stat st;
   bool fresh;
-  int dstFd = fstat(srcFd, &st) == 0 ? OpenDestinationFolder(to, fresh) : -1;
-  if (dstFd < 0) {
-    close(srcFd);
-    return 1;
-  }
+  UniqueFd dstFd = fstat(srcFd.get(), &st) == 0 ? OpenDestinationFolder(to, fresh) : UniqueFd();
+  if (!dstFd.valid()) return 1;
   FolderId srcId(st.st_dev, st.st_ino);
-  job.destRoot = IdOf(dstFd);
+  job.destRoot = IdOf(dstFd.get());
   job.hasDestRoot = true;
   job.destPath = TrimFolder(to);
   if (job.destRoot != srcId) {
     job.openFolders.push_back(srcId);
-    CopyFolderContents(job, srcFd, dstFd, fresh, 0);
-    if (fresh) StampFolder(dstFd, st);
+    CopyFolderContents(job, srcFd.get(), dstFd.get(), fresh, 0);
+    if (fresh && !StampFolder(dstFd.get(), st)) NoteFailure(job, job.destPath);
   }
-  close(dstFd);
-  close(srcFd);
   return job.failed ? 1 : 0;
 }
 

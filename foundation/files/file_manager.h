@@ -52,18 +52,18 @@ class VXM_EXPORT vxFileManager {
   // Missing destination folders are created. Each file is written to a temporary name in its
   // destination folder and renamed into place, keeping the source's mode and times; the kernel's
   // copy_file_range is used where it works. Symbolic links are copied as links, never followed.
-  static int CopyFile(const vxStringBase& from, const vxStringBase& to, unsigned int tree,
+  [[nodiscard]] static int CopyFile(const vxStringBase& from, const vxStringBase& to, unsigned int tree,
                       unsigned int replace, unsigned int newerOnly, unsigned int reserved1,
                       unsigned int reserved2, const char* text1, const char* text2);
-  static int CopyFile(const vxFilename& from, const vxFilename& to, unsigned int tree,
+  [[nodiscard]] static int CopyFile(const vxFilename& from, const vxFilename& to, unsigned int tree,
                       unsigned int replace, unsigned int newerOnly, unsigned int reserved1,
                       unsigned int reserved2, const char* text1, const char* text2);
 
   // Removes a file. 0 on success; with missingIsSuccess 1 a file that is not there also gives 0.
-  static int DeleteFile(const vxStringBase& path, unsigned int missingIsSuccess);
+  [[nodiscard]] static int DeleteFile(const vxStringBase& path, unsigned int missingIsSuccess);
   // Creates the folder and any missing parents (mode 0777 less the umask). 0 when it exists
   // afterwards. attributes is unused (callers pass null).
-  static int CreateDirectory(const vxStringBase& path, const void* attributes);
+  [[nodiscard]] static int CreateDirectory(const vxStringBase& path, const void* attributes);
   // The process's current folder (empty when it cannot be read).
   static void GetCurrentDirectory(vxStringBase& result);
   // The running program's real file as the kernel reports it (empty when it cannot be read).

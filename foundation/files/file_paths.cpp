@@ -79,21 +79,32 @@ void vxFileManager::MakePath(vxStringBase& result, const vxStringBase& folder,
 int vxFileManager::DeleteFile(const vxStringBase& path, unsigned int missingIsSuccess) {
   if (path.isEmpty() || !vxfiles::MayWrite(path.view())) return 1;
   if (unlink(path.c_str()) == 0) return 0;
-  return (errno == ENOENT && missingIsSuccess != 0) ? 0 : 1;
+  if (errno == ENOENT && missingIsSuccess != 0) return 0;
+  vxfiles::NoteWriteFailure(errno, path.view());
+  return 1;
 }
 
 int vxFileManager::CreateDirectory(const vxStringBase& path, const void* /*attributes*/) {
   std::string folder = FolderPart(path.view());
   if (folder.empty() || !vxfiles::MayWriteInto(path.view())) return 1;
-  if (mkdir(folder.c_str(), 0777) != 0 && errno == ENOENT) {
-    // Parents first. Failures are not looked at here: the final test says whether it worked.
+  if (mkdir(folder.c_str(), 0777) == 0 || errno == EEXIST) {
+    return vxFilename::IsDirectory(folder.c_str()) ? 0 : 1;
+  }
+  if (errno == ENOENT) {
+    // Parents first; one that exists already (or appears meanwhile) is no failure.
     for (size_t slash = folder.find('/', 1); slash != std::string::npos;
          slash = folder.find('/', slash + 1)) {
-      mkdir(folder.substr(0, slash).c_str(), 0777);
+      const std::string parent = folder.substr(0, slash);
+      if (mkdir(parent.c_str(), 0777) != 0 && errno != EEXIST) {
+        vxfiles::NoteWriteFailure(errno, parent);
+      }
     }
-    mkdir(folder.c_str(), 0777);
+    if (mkdir(folder.c_str(), 0777) == 0 || errno == EEXIST) {
+      return vxFilename::IsDirectory(folder.c_str()) ? 0 : 1;
+    }
   }
-  return vxFilename::IsDirectory(folder.c_str()) ? 0 : 1;
+  vxfiles::NoteWriteFailure(errno, folder);
+  return 1;
 }
 
 void vxFileManager::GetCurrentDirectory(vxStringBase& result) {

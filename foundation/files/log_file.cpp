@@ -29,8 +29,9 @@ std::string TimeStamp() {
 
 vxLogFile::vxLogFile(const vxStringBase& filename, unsigned int mode) : filename_(filename) {
   int flags = O_WRONLY | O_CREAT | O_CLOEXEC | (mode == 1 ? O_TRUNC : O_APPEND);
+  errno = 0;
   if (!vxfiles::MayWriteInPlace(filename_.view())) {  // no log where the run may not write
-    openError_ = EPERM;
+    openError_ = errno != 0 ? errno : EPERM;  // the doors' reason when they give one
     return;
   }
   // A link where the log belongs is removed, never followed: it could point into the source

@@ -10,6 +10,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cstring>
 #include <string_view>
 #include <vector>
 
@@ -156,7 +157,19 @@ void vxRunDoors::SweepOnce(const std::string& realFolder) {
   close(fd);
 }
 
+void vxRunDoors::NoteWriteFailure(int error, std::string_view path) {
+  if (stoppedBy_ != 0 || (error != ENOSPC && error != EDQUOT && error != EIO)) return;
+  stoppedBy_ = error;
+  const std::string text =
+      std::string("Error: Writing stopped (") + strerror(error) + ") after a failed write to: ";
+  Refuse(text.c_str(), path);
+}
+
 bool vxRunDoors::AdmitWrite(std::string_view path) {
+  if (stoppedBy_ != 0) {
+    errno = stoppedBy_;
+    return false;
+  }
   const std::string text = AbsoluteText(path);
   const std::string last = LastPart(text);
   if (text.empty() || text == "/" || last == "." || last == "..") {
@@ -167,6 +180,10 @@ bool vxRunDoors::AdmitWrite(std::string_view path) {
 }
 
 bool vxRunDoors::AdmitWriteInto(std::string_view folder) {
+  if (stoppedBy_ != 0) {
+    errno = stoppedBy_;
+    return false;
+  }
   const std::string text = AbsoluteText(folder);
   if (text.empty()) {
     Refuse("Error: Refused to write an entry without a name: ", folder);
@@ -270,8 +287,18 @@ bool MayWriteInto(std::string_view folder) {
 
 bool MayWriteAt(int dirFd, const char* name) {
   vxRunDoors* doors = vxRunDoors::Current();
+  if (doors != nullptr && doors->StoppedBy() != 0) {
+    errno = doors->StoppedBy();
+    return false;
+  }
   vxWriteObserver* observer = doors == nullptr ? nullptr : doors->Observer();
   return observer == nullptr || observer->BeforeWriteAt(dirFd, name);
+}
+
+void NoteWriteFailure(int error, std::string_view path) {
+  vxRunDoors* doors = vxRunDoors::Current();
+  if (doors != nullptr) doors->NoteWriteFailure(error, path);
+  errno = error;
 }
 
 bool MayRead(std::string_view path) {

@@ -66,6 +66,14 @@ class VXM_EXPORT vxRunDoors {
   bool AdmitWrite(std::string_view path);
   // Entries may be made inside folder (resolved whole, a link at its end included).
   bool AdmitWriteInto(std::string_view folder);
+  // A write of the run failed with error on path. A full disk or quota (ENOSPC, EDQUOT) or a
+  // failing device (EIO) takes no more writes: the first such failure is reported and from then
+  // on every write is refused (errno is that error), so the run leaves what a run stopped at that
+  // point leaves, which a re-run finishes. Any other error concerns that one file only.
+  void NoteWriteFailure(int error, std::string_view path);
+  // The error that stopped the run's writes; 0 while they go on.
+  int StoppedBy() const { return stoppedBy_; }
+
   // path may be read. A path inside one of the installations (by its text) must lead, every link
   // followed, to an entry inside one of them; a path that leads nowhere is left to its reader to
   // report as missing. Other paths (the host's own files) are not installation reads.
@@ -105,6 +113,7 @@ class VXM_EXPORT vxRunDoors {
   FolderId destination_;
   bool inPlace_ = false;
   bool destinationInsideSource_ = false;
+  int stoppedBy_ = 0;
   std::unordered_map<std::string, Within> located_;  // real folder -> first installation above it
   std::unordered_set<std::string> swept_;            // destination folders cleared of stale temps
   vxRealPaths realPaths_;
@@ -122,6 +131,8 @@ VXM_EXPORT bool MayWriteInto(std::string_view folder);
 // created or replaced; false when the run's observer could not keep what stands there.
 VXM_EXPORT bool MayWriteAt(int dirFd, const char* name);
 VXM_EXPORT bool MayRead(std::string_view path);
+// Tells the current doors (if any) that a write on path failed with error; errno is kept.
+VXM_EXPORT void NoteWriteFailure(int error, std::string_view path);
 }  // namespace vxfiles
 
 #endif  // VXMIGRATE_FOUNDATION_FILES_RUN_DOORS_H_

@@ -131,8 +131,10 @@ vxRunJournal::vxRunJournal(const std::string& destination, const std::string& so
     id_ = id;
     break;
   }
-  if (fd_ >= 0 && !(Append("started " + std::to_string(static_cast<long long>(time(nullptr)))) &&
-                    Append("source " + vxJournalEscape(source)))) {
+  // Before the run's log exists: a failure here leaves the run without a journal, which the run
+  // reports once its log is open.
+  if (fd_ >= 0 && !(Write("started " + std::to_string(static_cast<long long>(time(nullptr)))) &&
+                    Write("source " + vxJournalEscape(source)))) {
     close(fd_);
     fd_ = -1;
   }
@@ -142,9 +144,16 @@ vxRunJournal::~vxRunJournal() {
   if (fd_ >= 0) close(fd_);
 }
 
-bool vxRunJournal::Append(const std::string& record) {
+bool vxRunJournal::Write(const std::string& record) {
   const std::string line = record + "\n";
   return fd_ >= 0 && vxWriteAll(fd_, line.data(), line.size());
+}
+
+// A journal that lost a record cannot give the old state back: the run's doors hear of it.
+bool vxRunJournal::Append(const std::string& record) {
+  if (Write(record)) return true;
+  if (fd_ >= 0) vxfiles::NoteWriteFailure(errno, Join(folder_, kRunJournalFile));
+  return false;
 }
 
 bool vxRunJournal::Relative(const std::string& absolute, std::string& relative) {
@@ -230,17 +239,19 @@ bool vxRunJournal::BeforeFolder(std::string_view folder) {
   return true;
 }
 
-void vxRunJournal::Finish(int result) {
+bool vxRunJournal::Finish(int result) {
+  bool ok = true;
   for (const std::string& relative : order_) {
     struct stat st;
     if (lstat(Join(destination_, relative).c_str(), &st) != 0) {
-      Append("after " + vxJournalEscape(relative) + " -");
+      ok = Append("after " + vxJournalEscape(relative) + " -") && ok;
       continue;
     }
-    Append("after " + vxJournalEscape(relative) + " " + std::to_string(st.st_ino) + " " +
-           std::to_string(st.st_size) + " " + std::to_string(st.st_mtim.tv_sec) + " " +
-           std::to_string(st.st_mtim.tv_nsec) + " " + std::to_string(st.st_mode));
+    ok = Append("after " + vxJournalEscape(relative) + " " + std::to_string(st.st_ino) + " " +
+                std::to_string(st.st_size) + " " + std::to_string(st.st_mtim.tv_sec) + " " +
+                std::to_string(st.st_mtim.tv_nsec) + " " + std::to_string(st.st_mode)) &&
+         ok;
   }
-  Append("end " + std::to_string(result));
-  fsync(fd_);
+  ok = Append("end " + std::to_string(result)) && ok;
+  return fsync(fd_) == 0 && ok;
 }

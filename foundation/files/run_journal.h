@@ -41,13 +41,14 @@ class vxRunJournal {
   // Keeps what stands at path before an entry there is created, replaced or removed (inPlace:
   // written where it stands). Only the first change of a path in the run is kept. False when the
   // old state could not be kept: the change must then not be made.
-  bool BeforeEntry(std::string_view path, bool inPlace);
+  [[nodiscard]] bool BeforeEntry(std::string_view path, bool inPlace);
   // Lists the folders on the way to folder that do not exist yet: the run is about to make them.
-  bool BeforeFolder(std::string_view folder);
+  [[nodiscard]] bool BeforeFolder(std::string_view folder);
 
   // Closes the journal: the state of every entry the run wrote, so that undo can tell a file
-  // changed afterwards, and the run's result.
-  void Finish(int result);
+  // changed afterwards, and the run's result. False when any of it could not be written (undo then
+  // treats the run as one that was stopped).
+  [[nodiscard]] bool Finish(int result);
 
  private:
   struct Kept {
@@ -58,8 +59,10 @@ class vxRunJournal {
   };
 
   bool Relative(const std::string& absolute, std::string& relative);
-  bool KeepOld(const std::string& relative, const std::string& path, bool inPlace);
-  bool Append(const std::string& record);
+  [[nodiscard]] bool KeepOld(const std::string& relative, const std::string& path, bool inPlace);
+  // One record line; Append also tells the run's doors when it fails.
+  [[nodiscard]] bool Write(const std::string& record);
+  [[nodiscard]] bool Append(const std::string& record);
 
   std::string destination_;
   vxRealPaths realPaths_;

@@ -14,16 +14,16 @@ namespace vxfiles {
 // Creates a new empty file with a fresh hidden name (".name.vxtmp.XXXXXX") in the folder open at
 // dirFd, opened for reading and writing, and returns its descriptor (-1 and errno on failure).
 // mode is given to open(2), so the umask applies.
-int CreateTempFileAt(int dirFd, const char* name, mode_t mode, std::string& tempName);
+[[nodiscard]] int CreateTempFileAt(int dirFd, const char* name, mode_t mode, std::string& tempName);
 
 // Creates a symbolic link to target with a fresh hidden name in the folder open at dirFd. 0 on
 // success, -1 and errno on failure.
-int CreateTempLinkAt(int dirFd, const char* name, const char* target, std::string& tempName);
+[[nodiscard]] int CreateTempLinkAt(int dirFd, const char* name, const char* target, std::string& tempName);
 
 // Renames tempName onto name, both in the folder open at dirFd. replace false never overwrites:
 // an entry that exists, or appears meanwhile, makes it fail with errno EEXIST. The temporary entry
 // is left for the caller to remove when this fails. 0 on success, -1 and errno on failure.
-int CommitTempAt(int dirFd, const char* tempName, const char* name, bool replace);
+[[nodiscard]] int CommitTempAt(int dirFd, const char* tempName, const char* name, bool replace);
 
 // True for a name this project gives its temporary entries (".name.vxtmp.XXXXXX").
 bool IsTempName(const std::string& name);

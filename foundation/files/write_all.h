@@ -10,7 +10,7 @@
 #include <cstddef>
 
 // True when all size bytes were written; false on the first error other than EINTR.
-inline bool vxWriteAll(int fd, const char* data, size_t size) {
+[[nodiscard]] inline bool vxWriteAll(int fd, const char* data, size_t size) {
   while (size > 0) {
     ssize_t n = write(fd, data, size);
     if (n < 0) {

@@ -57,15 +57,15 @@ class VXM_EXPORT vxMappedINIFile {
   // the file's mode kept); a loaded file whose content did not change is left untouched. save 0:
   // drops the changes. Returns 0 on success; 1 when writing failed or was refused because the
   // file exists but was not loaded by this object.
-  int Close(unsigned int save);
+  [[nodiscard]] int Close(unsigned int save);
   // As Close, and with save 1 the file and its folder are also flushed to disk before returning.
-  int CloseFW(unsigned int save);
+  [[nodiscard]] int CloseFW(unsigned int save);
 
   // Writes the sections to path as a new file, atomically, and never replaces an entry already
   // there (nor one that appears meanwhile). The file takes the mode of the file the content was
   // read from, else 0666 less the umask; missing folders are made. The object stays bound to its
   // own name. 0 written; 1 failed; 2 path exists and was left as it is.
-  int CreateAs(const vxStringBase& path);
+  [[nodiscard]] int CreateAs(const vxStringBase& path);
 
   // Makes this object a copy of other's content (sections, lines, layout) in memory, as if read
   // from the same text; its own name stays, and it counts as not loaded from it.
@@ -128,7 +128,7 @@ class VXM_EXPORT vxMappedINIFile {
   INILine* CopyForThisFile(const INILine& line) const;
   void CopyMissingKeys(Section& section, const INILineList& lines);
   void Clear();
-  int Write(bool flushToDisk);
+  [[nodiscard]] int Write(bool flushToDisk);
   bool SameAsLoaded() const;
 
   vxStringBase filename_;

@@ -113,7 +113,9 @@ TEST(RunJournal, UndoGivesBackTheTreeOrNamesWhatChangedSince) {
       vxRunJournal journal(dst, "/the/source");
       ASSERT_TRUE(journal.IsOpen());
       c.run(journal, dst);
-      if (c.finished) journal.Finish(0);
+      if (c.finished) {
+        ASSERT_TRUE(journal.Finish(0));
+      }
     }
     ASSERT_NE(before, UserTree(dst));
     if (c.after) c.after(dst);

@@ -102,8 +102,10 @@ TEST(DataFileMerge, MissingOrUnwritableFiles) {
   EXPECT_EQ(1, run.manager().DoMergeCSVFile("d.txt", "d.txt"));
   EXPECT_EQ((std::vector<std::string>{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}),
             ListTree(run.Dst("")));
+  // A source that is not there is no failure; the folder in the way is, and the log says so.
   const std::string copying = "TXT file doesn't exist - file being copied: ";
-  EXPECT_EQ((std::vector<std::string>{copying + run.Src("a.txt"), copying + run.Src("dat/b.txt")}),
+  EXPECT_EQ((std::vector<std::string>{copying + run.Src("a.txt"), copying + run.Src("dat/b.txt"),
+                                      "Error: Unable to write file:   " + run.Dst("d.txt")}),
             run.Logged());
 }
 

@@ -149,10 +149,13 @@ TEST(HostCommandLine, LogThatLosesEntriesIsAnError) {
   HostRun run({"p10_pavsuite"});
   EXPECT_EQ(4, run.Run(run.Options({"pavsuite", "pavsuite", "5.0", "5.5"}), -1, true));
   EXPECT_EQ("", ReadFile(run.log));
-  // The undo journal cannot be kept either (a notice), and the report is not written (an error).
-  EXPECT_EQ("vxmigrate: the log " + run.log + " lost entries: File too large\nError: Unable to "
-            "write file:   " + run.dst + "/vxmigrate-report.json\n", run.Err());
-  EXPECT_TRUE(Has(run.Out(), "Errors:               1\nManual actions:       1\nLog:                  " +
+  // The undo journal cannot be kept either, nor the report written: errors both.
+  EXPECT_EQ("Error: No undo journal could be kept; this run cannot be undone: " + run.dst +
+                "\nvxmigrate: the log " + run.log +
+                " lost entries: File too large\nError: Unable to write file:   " + run.dst +
+                "/vxmigrate-report.json\n",
+            run.Err());
+  EXPECT_TRUE(Has(run.Out(), "Errors:               2\nManual actions:       0\nLog:                  " +
                                  run.log + " (incomplete: File too large)\n"))
       << run.Out();
 }

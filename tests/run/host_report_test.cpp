@@ -95,24 +95,23 @@ TEST(HostReport, QuietKeepsOnlyErrorsAndVerbosePrintsEveryEntry) {
 }
 
 // Each case breaks one file for the unprivileged user the run drops to, and names the error that
-// must reach standard error, whether the log holds it, and a text no log line may hold.
+// must reach both standard error and the log.
 TEST(HostReport, EveryFailedReadOrWriteNamesItsFile) {
   struct Case {
     const char* file;   // under the test root
     mode_t mode;
     std::string error;  // "$SRC" and "$DST" stand for the installations
-    bool logged;        // false: the step's log stays silent; only the terminal hears of it
     int errors;         // in the summary
   } cases[] = {
-      {"src/adviews.txt", 0, "Error: Unable to open file:   $SRC/adviews.txt", false, 1},
-      {"dst/adviews.txt", 0444, "Error: Unable to write file:   $DST/adviews.txt", false, 1},
-      {"src/vxintra.txt", 0, "Error: Unable to open file:   $SRC/vxintra.txt", false, 1},
-      {"dst/vxintra.txt", 0444, "Error: Unable to write file:   $DST/vxintra.txt", false, 1},
-      {"src/keywords.ini", 0, "Error: Unable to open file:   $SRC/keywords.ini", false, 1},
-      {"dst/keywords.ini", 0, "Error: Unable to open file:   $DST/keywords.ini", false, 1},
+      {"src/adviews.txt", 0, "Error: Unable to open file:   $SRC/adviews.txt", 1},
+      {"dst/adviews.txt", 0444, "Error: Unable to write file:   $DST/adviews.txt", 1},
+      {"src/vxintra.txt", 0, "Error: Unable to open file:   $SRC/vxintra.txt", 1},
+      {"dst/vxintra.txt", 0444, "Error: Unable to write file:   $DST/vxintra.txt", 1},
+      {"src/keywords.ini", 0, "Error: Unable to open file:   $SRC/keywords.ini", 1},
+      {"dst/keywords.ini", 0, "Error: Unable to open file:   $DST/keywords.ini", 1},
       // Only the destination's profile folder is read-only: the readable source is not to blame.
       {"dst/vxm_vxx/datfiles/profiles", 0555,
-       "Error: Unable to write file:   $DST/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp", true, 2},
+       "Error: Unable to write file:   $DST/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp", 2},
   };
   for (const Case& c : cases) {
     SCOPED_TRACE(c.file);
@@ -127,7 +126,7 @@ TEST(HostReport, EveryFailedReadOrWriteNamesItsFile) {
     EXPECT_TRUE(Has(run.Out(), "Errors:               " + std::to_string(c.errors) + "\n"))
         << run.Out();
     const std::string log = ReadFile(run.log);
-    EXPECT_EQ(c.logged, Has(log, error)) << log;
+    EXPECT_TRUE(Has(log, error)) << log;
     EXPECT_FALSE(Has(log, "Error: Unable to open file:   " + run.src + "/vxm_log/datfiles/shop.wlp"));
   }
 }
