@@ -3,6 +3,7 @@
 // first line. Close(1) never replaces an existing file this object did not load, and leaves a
 // loaded file alone when nothing in it changed; CreateAs never replaces anything.
 
+#include <algorithm>
 #include <cerrno>
 #include <functional>
 
@@ -18,7 +19,9 @@ class INIFileWriter {
   INIFileWriter(const vxMappedINIFile& file, Sink sink)
       : file_(file), sink_(std::move(sink)), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
     if (file.text_) text_ = *file.text_;
-    buffer_.reserve(kChunk + 4096);
+    // Most settings files are a few kilobytes: a chunk's worth of room for each would cost a large
+    // allocation (and its page faults) per file written or compared.
+    buffer_.reserve(std::min(kChunk, text_.size()) + 4096);
   }
   INIFileWriter(const INIFileWriter&) = delete;
   INIFileWriter& operator=(const INIFileWriter&) = delete;
