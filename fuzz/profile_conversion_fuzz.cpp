@@ -1,7 +1,8 @@
 // Converts an arbitrary profile "fuzz.wlp" the way each product pair does: the input's first byte
 // chooses the Halden-to-OBX edition conversion ('0'), the log product's upgrade ('1') or the OBX
 // upgrade ('2'), modulo three; the rest of the first line is ignored and the profile follows. The
-// old profile is only read, and a converted copy is never replaced by a second run.
+// old profile is only read, and a second run leaves the converted copy as the first left it (the
+// log product rewrites its installed profiles in place, so that copy is converted twice).
 
 #include <cstddef>
 #include <cstdint>
@@ -66,6 +67,6 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   conversion.run(run.manager());
   std::string again;
   vxfuzz::Check(vxfuzz::ReadFile(run.Dst(conversion.copy), &again) && again == copy,
-                "a converted profile is never replaced");
+                "a second run leaves the converted profile as it was");
   return 0;
 }
