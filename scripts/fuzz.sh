@@ -19,7 +19,7 @@ jobs=${FUZZ_JOBS:-1}
 if [ -d /dev/shm ] && [ -w /dev/shm ]; then export TMPDIR=/dev/shm; fi
 
 cmake --preset fuzz >/dev/null
-cmake --build --preset fuzz
+cmake --build --preset fuzz --target "${targets[@]/%/_fuzz}"
 bash fuzz/seeds.sh build/fuzz/seeds
 mkdir -p build/fuzz/findings build/fuzz/logs
 
