@@ -2,6 +2,7 @@
 // argument must read back as the last one of its name gave it, and the run is valid exactly when
 // the six values are present and the destination product is known.
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <map>
@@ -21,11 +22,10 @@ std::vector<std::string> Arguments(std::string_view input) {
   std::vector<std::string> arguments = {"vxmigrate"};
   while (!input.empty() && arguments.size() < kMaxArguments) {
     const std::size_t end = input.find('\n');
-    arguments.emplace_back(input.substr(0, end));
-    // The parser keeps C strings: an argument ends at its first NUL, as it would on a real line.
-    arguments.back().resize(arguments.back().find('\0') == std::string::npos
-                                ? arguments.back().size()
-                                : arguments.back().find('\0'));
+    std::string argument(input.substr(0, end));
+    // The parser takes C strings: an argument ends at its first NUL, as on a real command line.
+    argument.resize(std::min(argument.size(), argument.find('\0')));
+    arguments.push_back(argument);
     if (end == std::string_view::npos) break;
     input.remove_prefix(end + 1);
   }

@@ -99,8 +99,6 @@ ScratchRun::ScratchRun(const std::vector<std::string>& options) {
   arguments_.insert(arguments_.end(), options.begin(), options.end());
 }
 
-ScratchRun::~ScratchRun() { manager_.reset(); }
-
 std::string ScratchRun::Src(const std::string& relative) const {
   return ScratchPath("src/" + relative);
 }

@@ -53,7 +53,6 @@ inline void Check(bool holds, const char* property) {
 class ScratchRun {
  public:
   explicit ScratchRun(const std::vector<std::string>& options);
-  ~ScratchRun();
 
   ScratchRun(const ScratchRun&) = delete;
   ScratchRun& operator=(const ScratchRun&) = delete;

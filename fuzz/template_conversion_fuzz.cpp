@@ -4,6 +4,7 @@
 // standard template keeps its sections in order (objects are switched, never removed); and a
 // converted template is never replaced by a second run.
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <string>
