@@ -1,10 +1,11 @@
 #!/usr/bin/env bash
 # Installs what a fresh Debian 12 x86-64 machine lacks to build and test VXMigrate natively, as
-# i386 and under the sanitizers. Safe to run again: it installs only missing packages.
+# i386, under the sanitizers and as fuzz targets (clang and its libFuzzer runtime). Safe to run
+# again: it installs only missing packages.
 set -euo pipefail
 
 packages=(cmake ninja-build g++ g++-multilib pkgconf nettle-dev nettle-dev:i386 libgtest-dev
-          libgtest-dev:i386 libbenchmark-dev)
+          libgtest-dev:i386 libbenchmark-dev clang libclang-rt-dev)
 
 sudo_cmd=()
 if [ "$(id -u)" -ne 0 ]; then sudo_cmd=(sudo); fi

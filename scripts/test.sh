@@ -1,16 +1,21 @@
 #!/usr/bin/env bash
 # Builds VXMigrate and runs every test natively, as 32-bit x86 and under AddressSanitizer and
-# UndefinedBehaviorSanitizer. Installs missing packages first.
+# UndefinedBehaviorSanitizer, then runs each fuzz target over its seeds for a short while
+# (FUZZ_SMOKE_SECONDS each, default 20). Installs missing packages first. Arguments choose presets.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
 bash scripts/install-deps.sh
 
-presets=(native i386 asan)
+presets=(native i386 asan fuzz)
 if [ $# -gt 0 ]; then presets=("$@"); fi
 
 for preset in "${presets[@]}"; do
   echo "=== $preset ==="
+  if [ "$preset" = fuzz ]; then
+    bash scripts/fuzz.sh "${FUZZ_SMOKE_SECONDS:-20}"
+    continue
+  fi
   cmake --preset "$preset" >/dev/null
   cmake --build --preset "$preset"
   ctest --preset "$preset"

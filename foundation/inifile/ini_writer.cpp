@@ -3,6 +3,7 @@
 // first line. Close(1) never replaces an existing file this object did not load, and leaves a
 // loaded file alone when nothing in it changed; CreateAs never replaces anything.
 
+#include <algorithm>
 #include <cerrno>
 #include <functional>
 
@@ -18,7 +19,9 @@ class INIFileWriter {
   INIFileWriter(const vxMappedINIFile& file, Sink sink)
       : file_(file), sink_(std::move(sink)), fileEol_(vxini::EolText(file.fileEol_, vxini::Eol::kLF)) {
     if (file.text_) text_ = *file.text_;
-    buffer_.reserve(kChunk + 4096);
+    // Most settings files are a few kilobytes: a chunk's worth of room for each would cost a large
+    // allocation (and its page faults) per file written or compared.
+    buffer_.reserve(std::min(kChunk, text_.size()) + 4096);
   }
   INIFileWriter(const INIFileWriter&) = delete;
   INIFileWriter& operator=(const INIFileWriter&) = delete;
@@ -77,12 +80,23 @@ void INIFileWriter::PutProperty(const INILine& line) {
   std::string_view key = line.m_key.view();
   if (key != line.LoadedKey()) key = vxini::OneLine(key);
   std::string_view value = line.m_value.view();
-  if (value != line.LoadedValue()) value = vxini::OneLine(value);
+  std::string_view beforeValue = line.Text(line.keyEnd_, line.valueBegin_);
+  std::string_view afterValue = line.Text(line.valueEnd_, line.rawEnd_);
+  if (value != line.LoadedValue()) {
+    value = vxini::OneLine(value);
+    // A value read back loses the blanks at its ends to the line's spacing. A new value that
+    // brings blanks of its own replaces that spacing on its side, so that setting it again (as
+    // every re-run of a migration does) writes the same line instead of one blank more each time.
+    if (!value.empty() && vxini::IsBlank(value.front())) {
+      while (!beforeValue.empty() && vxini::IsBlank(beforeValue.back())) beforeValue.remove_suffix(1);
+    }
+    if (!value.empty() && vxini::IsBlank(value.back())) afterValue = std::string_view();
+  }
   Put(line.Text(line.rawBegin_, line.keyBegin_));
   Put(key);
-  Put(line.Text(line.keyEnd_, line.valueBegin_));
+  Put(beforeValue);
   Put(value);
-  Put(line.Text(line.valueEnd_, line.rawEnd_));
+  Put(afterValue);
   Put(vxini::EolText(line.eol_, file_.fileEol_));
 }
 

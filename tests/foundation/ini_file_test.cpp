@@ -15,6 +15,7 @@
 #include <vector>
 
 #include "foundation/inifile/ini_file.h"
+#include "support/process_state.h"
 #include "support/test_files.h"
 
 namespace {
@@ -94,6 +95,10 @@ INSTANTIATE_TEST_SUITE_P(
                          {"defaults", "added", "n"}, {"c", "k", "w"}}),
                     "[Defaults]\r\n  Path  =  new \r\nk = v\r\nk=2\r\nadded=n\r\n; tail\r\n\r\n"
                     "[b]\r\nz=1\r\n[c]\r\nk=w\r\n"},
+        // A value with blanks at its ends takes the place of the line's spacing on that side, so
+        // that setting it again leaves the line as it is instead of adding blanks on every run.
+        RewriteCase{"ValueWithBlankEndsReplacesTheSpacing", "[a]\nk = old \t\nl=x  \n",
+                    Set({{"a", "k", "  new "}, {"a", "l", "x  "}}), "[a]\nk =  new \nl=x  \n"},
         // A caller's text is written up to its first line break.
         RewriteCase{"NewSectionAfterPreambleOnly", "; only a comment",
                     Set({{"s", "n", "-42"}, {"s", "k", "x\n[evil]\nk=y"}, {"s", "", "v"}}),
@@ -261,13 +266,14 @@ TEST(IniFile, FailedWriteKeepsTheOldFile) {
   Ini ini(dir.Path("a.ini").c_str());
   ASSERT_EQ(0, ini.Open(1));
   ini.SetVal("a", "k", std::string(64 * 1024, 'x').c_str());
-  struct rlimit old;
-  ASSERT_EQ(0, getrlimit(RLIMIT_FSIZE, &old));
-  struct rlimit small = {4096, old.rlim_max};
-  signal(SIGXFSZ, SIG_IGN);  // a write beyond the limit fails instead of killing the process
-  ASSERT_EQ(0, setrlimit(RLIMIT_FSIZE, &small));
-  int result = ini.Close(1);
-  setrlimit(RLIMIT_FSIZE, &old);
+  int result = 0;
+  {
+    // A write beyond the limit fails instead of killing the process.
+    vxtest::ScopedSignalDisposition ignored(SIGXFSZ, SIG_IGN);
+    vxtest::ScopedResourceLimit small(RLIMIT_FSIZE, 4096);
+    ASSERT_TRUE(small.ok());
+    result = ini.Close(1);
+  }
   EXPECT_EQ(1, result);
   EXPECT_EQ("[a]\nk=1\n", ReadFile(dir.Path("a.ini")));
   EXPECT_EQ(Names{"a.ini"}, vxtest::ListTree(dir.path()));

@@ -18,6 +18,7 @@
 #include <utility>
 #include <vector>
 
+#include "support/process_state.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -25,33 +26,6 @@ namespace vxtest {
 using Tree = std::map<std::string, std::string>;
 // Every whole version a run put in place, by name below its destination, as Tree holds them.
 using Versions = std::map<std::string, std::set<std::string>>;
-
-// Sets environment variables for the host runs started while it lives; restores them afterwards.
-class ScopedEnvironment {
- public:
-  ScopedEnvironment() = default;
-  ScopedEnvironment(const ScopedEnvironment&) = delete;
-  ScopedEnvironment& operator=(const ScopedEnvironment&) = delete;
-  ~ScopedEnvironment() {
-    for (const auto& [name, previous] : saved_) {
-      if (previous.first) {
-        setenv(name.c_str(), previous.second.c_str(), 1);
-      } else {
-        unsetenv(name.c_str());
-      }
-    }
-  }
-  void Set(const std::string& name, const std::string& value) {
-    if (saved_.count(name) == 0) {
-      const char* previous = getenv(name.c_str());
-      saved_[name] = {previous != nullptr, previous != nullptr ? previous : ""};
-    }
-    setenv(name.c_str(), value.c_str(), 1);
-  }
-
- private:
-  std::map<std::string, std::pair<bool, std::string>> saved_;
-};
 
 // The shim in the hosts started while environment lives, writing the number of changes a run
 // made to countFile at a normal exit. The shim comes first in the host process, ahead of the

@@ -14,6 +14,7 @@
 
 #include "run/countdown_run.h"
 #include "run/host_run.h"
+#include "support/process_state.h"
 #include "support/test_files.h"
 
 namespace vxtest {

@@ -4,10 +4,11 @@
 
 #include <gtest/gtest.h>
 #include <grp.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdlib>
+
+#include "support/process_state.h"
 
 namespace vxtest {
 namespace {
@@ -28,20 +29,13 @@ bool AsUnprivilegedUser(const std::vector<std::string>& folders, const std::func
       if (!GiveAway(folder)) return false;
     }
   }
-  fflush(stdout);
-  const pid_t pid = fork();
-  if (pid < 0) return false;
-  if (pid == 0) {
+  return InChildProcess([&] {
     if (root && (setgroups(0, nullptr) != 0 || setgid(kNobody) != 0 || setuid(kNobody) != 0)) {
-      _exit(2);
+      ADD_FAILURE() << "cannot become user " << kNobody;
+      return;
     }
     body();
-    fflush(stdout);
-    _exit(::testing::Test::HasFailure() ? 1 : 0);
-  }
-  int status = 0;
-  if (waitpid(pid, &status, 0) != pid) return false;
-  return WIFEXITED(status) && WEXITSTATUS(status) == 0;
+  });
 }
 
 }  // namespace vxtest
