@@ -40,6 +40,6 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   vxfuzz::Check(merged.CreateAs(vxStringBase(written.c_str())) == 0, "a merged copy can be written");
   vxfuzz::Check(vxfuzz::ReadFile(written, &text) && text == input,
                 "merging a file into its own copy changes nothing");
-  file.Close(0);
+  vxfuzz::Check(file.Close(0) == 0, "closing without saving writes nothing and succeeds");
   return 0;
 }
