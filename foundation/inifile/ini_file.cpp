@@ -1,7 +1,8 @@
-// The INI model's lookups and changes: sections and keys found through hash indexes that ignore
-// ASCII case, values set in their line's place, keys and sections added after the existing ones,
-// and whole sections and files merged in with this file's values winning. Reading and writing the
-// file live in ini_reader.cpp and ini_writer.cpp.
+// The INI model's lookups and changes: sections and the keys of long sections found through hash
+// indexes that ignore ASCII case, the keys of short ones by a scan, values set in their line's
+// place, keys and sections added after the existing ones, and whole sections and files merged in
+// with this file's values winning. Reading and writing the file live in ini_reader.cpp and
+// ini_writer.cpp.
 
 #include <algorithm>
 #include <unordered_set>
@@ -103,6 +104,7 @@ vxMappedINIFile::Section* vxMappedINIFile::FindOrAddSection(std::string_view nam
 }
 
 INILine* vxMappedINIFile::FindLine(const Section& section, std::string_view key) const {
+  if (!section.WantsIndex()) return section.Scan(key);
   section.EnsureIndex();
   INILine* found = FindIndexedLine(section, key);
   if (found == nullptr && section.index.count(key) != 0) {
@@ -126,11 +128,16 @@ INILine* vxMappedINIFile::FindIndexedLine(const Section& section, std::string_vi
 
 void vxMappedINIFile::AppendLine(Section& section, INILine* line) {
   std::unique_ptr<INILine> owned(line);
-  section.EnsureIndex();
+  const bool indexed = section.IndexIsCurrent();
   section.lines.push_back(line);
   owned.release();
-  section.Index(line);
-  section.indexedCount = section.lines.size();
+  // A current index is kept current; any other is built afresh when a lookup needs it.
+  if (indexed) {
+    section.Index(line);
+    section.indexedCount = section.lines.size();
+  } else {
+    section.indexedCount = static_cast<size_t>(-1);
+  }
 }
 
 INILine* vxMappedINIFile::CopyForThisFile(const INILine& line) const {
@@ -217,20 +224,27 @@ int vxMappedINIFile::RemoveKey(const vxStringBase& section, const vxStringBase& 
     }
   }
 
-  // Drop the index entry before the line (its key lives in the line's text); a later line with
-  // the same key, if any, becomes the one found.
-  auto entry = found->index.find(line->LoadedKey());
-  if (entry != found->index.end() && entry->second == line) found->index.erase(entry);
-  pos = lines.erase(pos);
-  for (auto later = pos; later != lines.end(); ++later) {
-    if (vxini::EqualsFolded((*later)->LoadedKey(), line->LoadedKey())) {
-      found->index.emplace((*later)->LoadedKey(), *later);
-      break;
+  if (found->IndexIsCurrent()) {
+    // Drop the index entry before the line (its key lives in the line's text); a later line with
+    // the same key, if any, becomes the one found.
+    auto entry = found->index.find(line->LoadedKey());
+    if (entry != found->index.end() && entry->second == line) found->index.erase(entry);
+    pos = lines.erase(pos);
+    for (auto later = pos; later != lines.end(); ++later) {
+      if (vxini::EqualsFolded((*later)->LoadedKey(), line->LoadedKey())) {
+        found->index.emplace((*later)->LoadedKey(), *later);
+        break;
+      }
     }
+    found->indexedCount = lines.size();
+    // Spellings that differ in case alone: which line each spelling finds is rebuilt whole.
+    if (!found->exact.empty()) found->RebuildIndex();
+  } else {
+    lines.erase(pos);
+    found->index.clear();  // its keys live in the lines' texts, this one's included
+    found->exact.clear();
+    found->indexedCount = static_cast<size_t>(-1);
   }
-  found->indexedCount = lines.size();
-  // Spellings that differ in case alone: which line each spelling finds is rebuilt whole.
-  if (!found->exact.empty()) found->RebuildIndex();
   delete line;
   return 0;
 }
@@ -284,11 +298,8 @@ void vxMappedINIFile::MergeFrom(const vxMappedINIFile& other, vxIniMergeObserver
     // their namesakes here ignoring case, so only the first of a name counts.
     if (other.sectionIndex_.find(from->name)->second != from.get()) continue;
     Section* target = FindOrAddSection(from->name);
-    from->EnsureIndex();
     for (const INILine* line : from->lines) {
-      if (line == nullptr) continue;
-      auto first = from->index.find(line->LoadedKey());
-      if (first == from->index.end() || first->second != line) continue;  // a repeated key
+      if (line == nullptr || !from->IsFirstOfKey(line)) continue;
       const INILine* kept = FindLine(*target, line->m_key.view());
       if (kept != nullptr) {  // the destination wins
         if (observer != nullptr && !(kept->m_value == line->m_value)) {

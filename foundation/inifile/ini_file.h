@@ -1,9 +1,10 @@
 // An INI settings file held in memory as sections of key-value lines. Lookups of sections and keys
 // ignore ASCII case and keep the spelling on disk; a name spelt exactly as one on disk finds that
 // one first, so two keys that differ in case alone keep their own values. Each lookup costs
-// constant average time. A file opened
-// and written back unchanged is byte-identical. Close(1) replaces the file atomically and never
-// replaces an existing file that this object did not load. Not thread-safe.
+// constant average time (a short section is scanned, which is cheaper than hashing for a handful
+// of keys). A file opened and written back unchanged is byte-identical. Close(1) replaces the
+// file atomically and never replaces an existing file that this object did not load. Not
+// thread-safe.
 
 #ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
 #define VXMIGRATE_FOUNDATION_INIFILE_INI_FILE_H_
@@ -121,8 +122,8 @@ class VXM_EXPORT vxMappedINIFile {
   void RebuildSectionIndex();
   INILine* FindIndexedLine(const Section& section, std::string_view key) const;
   Section* FindOrAddSection(std::string_view name);
-  // The first line of the section with that key, or null. Rebuilds the section's index when the
-  // callers changed its list behind the object's back.
+  // The first line of the section with that key, or null. A long section's index is rebuilt when
+  // the callers changed its list behind the object's back.
   INILine* FindLine(const Section& section, std::string_view key) const;
   void AppendLine(Section& section, INILine* line);   // takes ownership
   INILine* CopyForThisFile(const INILine& line) const;

@@ -1,8 +1,8 @@
 // One section of a vxMappedINIFile: its header line, its property lines in file order, the
-// non-property lines after the last property line, and a lazily built index from the key (ASCII
-// case ignored) to the first line holding it. Keys that differ from that first line's only in case
-// are also indexed by their exact spelling, so a lookup spelt exactly as a later key finds that
-// key. Internal to the INI model; owns its lines.
+// non-property lines after the last property line, and, for a section of many lines, a lazily
+// built index from the key (ASCII case ignored) to the first line holding it. Keys that differ from
+// that first line's only in case are also indexed by their exact spelling, so a lookup spelt
+// exactly as a later key finds that key. Internal to the INI model; owns its lines.
 
 #ifndef VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
 #define VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
@@ -27,6 +27,43 @@ struct vxMappedINIFile::Section {
   }
   Section(const Section&) = delete;
   Section& operator=(const Section&) = delete;
+
+  // Sections shorter than this are searched line by line: most sections (a template's report
+  // objects, a search engine, a profile's server) hold a handful of keys, and an index would cost
+  // them more to build and free than the few lookups it would speed up.
+  static constexpr size_t kIndexedFrom = 16;
+  bool WantsIndex() const { return lines.size() >= kIndexedFrom; }
+  bool IndexIsCurrent() const { return indexedCount == lines.size(); }
+
+  // The line a lookup of key finds in a short section: the first spelt exactly so, else the first
+  // whose key matches with ASCII case ignored (what the index gives a long one).
+  INILine* Scan(std::string_view key) const {
+    INILine* folded = nullptr;
+    for (INILine* line : lines) {
+      if (line == nullptr) continue;
+      std::string_view candidate = line->m_key.view();
+      if (candidate == key) return line;
+      if (folded == nullptr && vxini::EqualsFolded(candidate, key)) folded = line;
+    }
+    return folded;
+  }
+
+  // True for the first line holding this line's key as read (ASCII case ignored); a repeated key
+  // further down is hidden behind it.
+  bool IsFirstOfKey(const INILine* line) const {
+    if (!WantsIndex()) {
+      for (const INILine* other : lines) {
+        if (other == line) return true;
+        if (other != nullptr && vxini::EqualsFolded(other->LoadedKey(), line->LoadedKey())) {
+          return false;
+        }
+      }
+      return false;
+    }
+    EnsureIndex();
+    auto first = index.find(line->LoadedKey());
+    return first != index.end() && first->second == line;
+  }
 
   // Makes the index match the lines when their number changed since it was built.
   void EnsureIndex() const {
