@@ -107,7 +107,7 @@ INILine* vxMappedINIFile::FindLine(const Section& section, std::string_view key)
   if (!section.WantsIndex()) return section.Scan(key);
   section.EnsureIndex();
   INILine* found = FindIndexedLine(section, key);
-  if (found == nullptr && section.index.count(key) != 0) {
+  if (found == nullptr && section.keys->first.count(key) != 0) {
     // A caller renamed a key in place: index the lines afresh and trust only a verified hit.
     section.RebuildIndex();
     found = FindIndexedLine(section, key);
@@ -117,11 +117,12 @@ INILine* vxMappedINIFile::FindLine(const Section& section, std::string_view key)
 
 // The line of key as indexed, when its key (which callers may have changed) still matches.
 INILine* vxMappedINIFile::FindIndexedLine(const Section& section, std::string_view key) const {
-  auto it = section.index.find(key);
-  if (it == section.index.end()) return nullptr;
-  if (!section.exact.empty() && it->second->m_key.view() != key) {
-    auto exact = section.exact.find(key);
-    if (exact != section.exact.end() && exact->second->m_key.view() == key) return exact->second;
+  const Section::KeyIndex& keys = *section.keys;
+  auto it = keys.first.find(key);
+  if (it == keys.first.end()) return nullptr;
+  if (!keys.exact.empty() && it->second->m_key.view() != key) {
+    auto exact = keys.exact.find(key);
+    if (exact != keys.exact.end() && exact->second->m_key.view() == key) return exact->second;
   }
   return vxini::EqualsFolded(it->second->m_key.view(), key) ? it->second : nullptr;
 }
@@ -136,7 +137,7 @@ void vxMappedINIFile::AppendLine(Section& section, INILine* line) {
     section.Index(line);
     section.indexedCount = section.lines.size();
   } else {
-    section.indexedCount = static_cast<size_t>(-1);
+    section.DropIndex();
   }
 }
 
@@ -227,23 +228,22 @@ int vxMappedINIFile::RemoveKey(const vxStringBase& section, const vxStringBase& 
   if (found->IndexIsCurrent()) {
     // Drop the index entry before the line (its key lives in the line's text); a later line with
     // the same key, if any, becomes the one found.
-    auto entry = found->index.find(line->LoadedKey());
-    if (entry != found->index.end() && entry->second == line) found->index.erase(entry);
+    Section::LineIndex& first = found->keys->first;
+    auto entry = first.find(line->LoadedKey());
+    if (entry != first.end() && entry->second == line) first.erase(entry);
     pos = lines.erase(pos);
     for (auto later = pos; later != lines.end(); ++later) {
       if (vxini::EqualsFolded((*later)->LoadedKey(), line->LoadedKey())) {
-        found->index.emplace((*later)->LoadedKey(), *later);
+        first.emplace((*later)->LoadedKey(), *later);
         break;
       }
     }
     found->indexedCount = lines.size();
     // Spellings that differ in case alone: which line each spelling finds is rebuilt whole.
-    if (!found->exact.empty()) found->RebuildIndex();
+    if (!found->keys->exact.empty()) found->RebuildIndex();
   } else {
     lines.erase(pos);
-    found->index.clear();  // its keys live in the lines' texts, this one's included
-    found->exact.clear();
-    found->indexedCount = static_cast<size_t>(-1);
+    found->DropIndex();  // its keys live in the lines' texts, this one's included
   }
   delete line;
   return 0;

@@ -8,6 +8,7 @@
 #define VXMIGRATE_FOUNDATION_INIFILE_INI_SECTION_H_
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -20,9 +21,15 @@ struct vxMappedINIFile::Section {
   using LineIndex = std::unordered_map<std::string_view, INILine*, vxini::FoldHash, vxini::FoldEqual>;
   using ExactIndex = std::unordered_map<std::string_view, INILine*>;
 
+  // The index of a long section, built when a lookup first needs it.
+  struct KeyIndex {
+    LineIndex first;  // views into the lines' own immutable text
+    ExactIndex exact;  // only keys that differ from an earlier key in case alone
+  };
+
   Section() = default;
   ~Section() {
-    index.clear();
+    keys.reset();  // its views point into the lines' texts
     for (INILine* line : lines) delete line;
   }
   Section(const Section&) = delete;
@@ -33,7 +40,11 @@ struct vxMappedINIFile::Section {
   // them more to build and free than the few lookups it would speed up.
   static constexpr size_t kIndexedFrom = 16;
   bool WantsIndex() const { return lines.size() >= kIndexedFrom; }
-  bool IndexIsCurrent() const { return indexedCount == lines.size(); }
+  bool IndexIsCurrent() const { return keys != nullptr && indexedCount == lines.size(); }
+  void DropIndex() {
+    keys.reset();
+    indexedCount = static_cast<size_t>(-1);
+  }
 
   // The line a lookup of key finds in a short section: the first spelt exactly so, else the first
   // whose key matches with ASCII case ignored (what the index gives a long one).
@@ -61,18 +72,17 @@ struct vxMappedINIFile::Section {
       return false;
     }
     EnsureIndex();
-    auto first = index.find(line->LoadedKey());
-    return first != index.end() && first->second == line;
+    auto first = keys->first.find(line->LoadedKey());
+    return first != keys->first.end() && first->second == line;
   }
 
   // Makes the index match the lines when their number changed since it was built.
   void EnsureIndex() const {
-    if (indexedCount != lines.size()) RebuildIndex();
+    if (!IndexIsCurrent()) RebuildIndex();
   }
   void RebuildIndex() const {
-    index.clear();
-    exact.clear();
-    index.reserve(lines.size());
+    keys = std::make_unique<KeyIndex>();
+    keys->first.reserve(lines.size());
     for (INILine* line : lines) {
       if (line != nullptr) Index(line);
     }
@@ -81,9 +91,9 @@ struct vxMappedINIFile::Section {
   // The first line of a key stays the one found; a later one spelt otherwise is found by its
   // exact spelling.
   void Index(INILine* line) const {
-    auto [first, added] = index.emplace(line->LoadedKey(), line);
+    auto [first, added] = keys->first.emplace(line->LoadedKey(), line);
     if (!added && first->second->LoadedKey() != line->LoadedKey()) {
-      exact.emplace(line->LoadedKey(), line);
+      keys->exact.emplace(line->LoadedKey(), line);
     }
   }
 
@@ -102,8 +112,7 @@ struct vxMappedINIFile::Section {
   uint32_t trailingEnd = 0;
   std::string carriedTrailing;  // lines kept from removed property lines, written before those
 
-  mutable LineIndex index;  // views into the lines' own immutable text
-  mutable ExactIndex exact;  // only keys that differ from an earlier key in case alone
+  mutable std::unique_ptr<KeyIndex> keys;  // null until built: short sections never build one
   mutable size_t indexedCount = static_cast<size_t>(-1);
 };
 
