@@ -3,31 +3,21 @@
 // installations, the source must come out byte for byte as it went in, and a folder outside both
 // must stay untouched. Also: one run per destination, and plug-ins only from beside the host.
 
-#include <fcntl.h>
 #include <gtest/gtest.h>
-#include <sys/file.h>
 #include <sys/stat.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <chrono>
 #include <cstdlib>
-#include <cstring>
-#include <map>
 #include <string>
 #include <thread>
-#include <vector>
 
+#include "run/host_run.h"
 #include "support/test_files.h"
-
-extern char** environ;
 
 namespace vxtest {
 namespace {
-
-using Lines = std::vector<std::string>;
-using Tree = std::map<std::string, std::string>;
 
 // How the host is started: argv[0], the current folder, and whether PATH stays in the environment.
 struct Launch {
@@ -36,30 +26,10 @@ struct Launch {
   bool keepPath = true;
 };
 
-// Starts the host with options; the child's pid. Standard output and error go to files.
 pid_t StartHost(const Lines& options, const Launch& launch, const std::string& out) {
-  pid_t pid = fork();
-  if (pid != 0) return pid;
-  int fd = open(out.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-  if (fd < 0 || chdir(launch.cwd.c_str()) != 0) _exit(126);
-  dup2(fd, 1);
-  dup2(fd, 2);
-  std::vector<char*> argv = {const_cast<char*>(launch.argv0.c_str())};
-  for (const std::string& option : options) argv.push_back(const_cast<char*>(option.c_str()));
-  argv.push_back(nullptr);
-  std::vector<char*> env;
-  for (char** e = environ; *e != nullptr; ++e) {
-    if (launch.keepPath || strncmp(*e, "PATH=", 5) != 0) env.push_back(*e);
-  }
-  env.push_back(nullptr);
-  execve(VXM_HOST_EXE, argv.data(), env.data());
-  _exit(127);
-}
-
-int Wait(pid_t pid) {
-  int status = 0;
-  waitpid(pid, &status, 0);
-  return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+  Lines args = {launch.argv0};
+  args.insert(args.end(), options.begin(), options.end());
+  return StartProcess(VXM_HOST_EXE, args, launch.cwd, out, "", launch.keepPath);
 }
 
 // Waits for a file that another process makes; false after a minute.
@@ -97,7 +67,7 @@ class Samples {
             "-V2:3.0"};
   }
   int Run(const std::string& destination, const Launch& launch = Launch()) const {
-    return Wait(StartHost(Options(destination), launch, Path("out.txt")));
+    return ExitStatus(StartHost(Options(destination), launch, Path("out.txt")));
   }
   std::string Output() const { return ReadFile(Path("out.txt")); }
   void Link(const std::string& at, const std::string& to) const {
@@ -215,15 +185,12 @@ TEST(Containment, ASecondRunOnTheSameDestinationIsRefusedWhileTheFirstCompletes)
   EXPECT_NE(std::string::npos, s.Output().find("another run is migrating into")) << s.Output();
   EXPECT_EQ(during, TreeState(s.obx));
   WriteFile(s.obx + "/go", "");
-  EXPECT_EQ(0, Wait(first));
-  Tree expected = TreeState(reference.obx), reached = TreeState(s.obx);
-  for (Tree* tree : {&expected, &reached}) {
-    for (const char* name : {"vxmigrate.log", "vxmigrate-report.json", "started"}) tree->erase(name);
-    // Each run's journal has its own times and inode numbers.
-    for (auto it = tree->begin(); it != tree->end();) {
-      it = it->first.compare(0, 10, ".vxmigrate") == 0 ? tree->erase(it) : std::next(it);
-    }
-  }
+  EXPECT_EQ(0, ExitStatus(first));
+  // Each run's journal has its own times and inode numbers.
+  Tree expected = WithoutBookkeeping(TreeState(reference.obx));
+  Tree reached = WithoutBookkeeping(TreeState(s.obx));
+  expected.erase("started");
+  reached.erase("started");
   EXPECT_EQ(expected, reached);
   EXPECT_EQ(LogEntries(reference.obx + "/vxmigrate.log").size(),
             LogEntries(s.obx + "/vxmigrate.log").size());

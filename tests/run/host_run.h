@@ -1,5 +1,6 @@
 // A temporary installation pair and a copy of the vxmigrate host with chosen plug-ins beside it,
-// for tests that run the real host process and look at its exit status, output and log.
+// for tests that run the real host process and look at its exit status, output and log; and the
+// child-process plumbing those tests share.
 
 #ifndef VXMIGRATE_TESTS_RUN_HOST_RUN_H_
 #define VXMIGRATE_TESTS_RUN_HOST_RUN_H_
@@ -13,19 +14,78 @@
 
 #include <algorithm>
 #include <csignal>
+#include <cstring>
 #include <filesystem>
+#include <map>
 #include <string>
 #include <vector>
 
 #include "support/test_files.h"
 
+extern char** environ;
+
 namespace vxtest {
 
 using Lines = std::vector<std::string>;
+using Tree = std::map<std::string, std::string>;
+
+inline const char* const kShippedPlugins[] = {"halden_to_obx", "halsuite_to_halsuite",
+                                              "log_to_log", "obx_to_obx"};
+
+inline bool Has(const std::string& text, const std::string& part) {
+  return text.find(part) != std::string::npos;
+}
+
+// The run's own bookkeeping: its log, its report and its undo journal, which every run changes.
+inline bool IsBookkeeping(const std::string& name) {
+  return name == "vxmigrate.log" || name == "vxmigrate-report.json" ||
+         name.rfind(".vxmigrate", 0) == 0;
+}
+
+inline Tree WithoutBookkeeping(Tree tree) {
+  for (auto entry = tree.begin(); entry != tree.end();) {
+    entry = IsBookkeeping(entry->first) ? tree.erase(entry) : std::next(entry);
+  }
+  return tree;
+}
+
+// Starts program with argument list args (args[0]: the name it sees) in folder cwd, standard
+// output to file out and standard error to err (to out when ""), its environment without PATH
+// unless keepPath; the child's pid.
+inline pid_t StartProcess(const std::string& program, Lines args, const std::string& cwd,
+                          const std::string& out, const std::string& err = "",
+                          bool keepPath = true) {
+  const pid_t child = fork();
+  if (child != 0) return child;
+  auto create = [](const std::string& path) {
+    return open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
+  };
+  const int outFd = create(out), errFd = err.empty() ? outFd : create(err);
+  if (outFd < 0 || errFd < 0 || dup2(outFd, 1) < 0 || dup2(errFd, 2) < 0 ||
+      chdir(cwd.c_str()) != 0) {
+    _exit(126);
+  }
+  std::vector<char*> argv, env;
+  for (std::string& arg : args) argv.push_back(arg.data());
+  argv.push_back(nullptr);
+  for (char** e = environ; *e != nullptr; ++e) {
+    if (keepPath || strncmp(*e, "PATH=", 5) != 0) env.push_back(*e);
+  }
+  env.push_back(nullptr);
+  execve(program.c_str(), argv.data(), env.data());
+  _exit(127);
+}
+
+// The child's exit status; -1 when it did not exit.
+inline int ExitStatus(pid_t child) {
+  int status = 0;
+  if (child <= 0 || waitpid(child, &status, 0) != child || !WIFEXITED(status)) return -1;
+  return WEXITSTATUS(status);
+}
 
 // A temporary bin folder holding a copy of the host, its library, "vxmigrate.ini" (unless told
-// otherwise) and the named plug-ins (test plug-ins, or "halden_to_obx", the shipped one), beside
-// empty "src" and "dst" folders.
+// otherwise) and the named plug-ins (test plug-ins, or shipped ones), beside empty "src" and "dst"
+// folders. The host runs from the temporary folder.
 class HostRun {
   TempDir root_;
 
@@ -35,14 +95,13 @@ class HostRun {
 
   explicit HostRun(const Lines& plugins, bool ranges = true) {
     for (const std::string& folder : {src, dst}) MakeDirs(folder);
-    const std::string host = VXM_HOST_EXE;
-    const std::string hostFolder = host.substr(0, host.rfind('/'));
-    Copy(host, "vxmigrate");
-    Copy(hostFolder + "/libvxmigrate.so.0", "libvxmigrate.so.0");
+    const std::string host = VXM_HOST_EXE, built = host.substr(0, host.rfind('/'));
+    Install(host, "vxmigrate");
+    Install(built + "/libvxmigrate.so.0", "libvxmigrate.so.0");
     for (const std::string& name : plugins) {
-      Copy(name == "halden_to_obx" ? hostFolder + "/" + name + ".so"
-                                   : VXM_TEST_PLUGIN_DIR "/" + name + ".so",
-           name + ".so");
+      const bool shipped = std::count(std::begin(kShippedPlugins), std::end(kShippedPlugins), name);
+      Install((shipped ? built : std::string(VXM_TEST_PLUGIN_DIR)) + "/" + name + ".so",
+              name + ".so");
     }
     if (ranges) {
       WriteFile(bin + "/vxmigrate.ini",
@@ -64,19 +123,28 @@ class HostRun {
 
   // Hands the whole test folder to uid (and the group of the same number), for runs as that user.
   void GiveTo(uid_t uid) const {
-    namespace fs = std::filesystem;
     lchown(root_.path().c_str(), uid, uid);
-    for (const auto& entry : fs::recursive_directory_iterator(root_.path())) {
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(root_.path())) {
       lchown(entry.path().c_str(), uid, uid);
     }
   }
 
-  // Runs the host with argv[0] = its full path and the given options, as user uid when given
-  // (the child drops to it before exec); its exit status, -1 when it did not exit. fullDisk: no
-  // file may grow (every write fails as on a full disk).
-  int Run(const Lines& options, int uid = -1, bool fullDisk = false) const {
-    std::vector<std::string> args = {bin + "/vxmigrate"};
+  // The host's command line: its full path, then options.
+  Lines Args(const Lines& options) const {
+    Lines args = {bin + "/vxmigrate"};
     args.insert(args.end(), options.begin(), options.end());
+    return args;
+  }
+
+  // Runs the host with the given options, as user uid when given (the child drops to it before
+  // exec); its exit status, -1 when it did not exit. fullDisk: no file may grow (every write fails
+  // as on a full disk).
+  int Run(const Lines& options, int uid = -1, bool fullDisk = false) const {
+    if (uid < 0 && !fullDisk) {
+      return ExitStatus(StartProcess(bin + "/vxmigrate", Args(options), root_.path(),
+                                     Path("out.txt"), Path("err.txt")));
+    }
+    Lines args = Args(options);
     std::vector<char*> argv;
     for (std::string& arg : args) argv.push_back(arg.data());
     argv.push_back(nullptr);
@@ -90,7 +158,8 @@ class HostRun {
     if (child == 0) {
       dup2(fullDisk ? pipes[0][1] : out, 1);
       dup2(fullDisk ? pipes[1][1] : err, 2);
-      if (uid >= 0 && (setgroups(0, nullptr) != 0 || setgid(uid) != 0 || setuid(uid) != 0)) {
+      if (chdir(root_.path().c_str()) != 0 ||
+          (uid >= 0 && (setgroups(0, nullptr) != 0 || setgid(uid) != 0 || setuid(uid) != 0))) {
         _exit(126);
       }
       if (fullDisk) {
@@ -101,10 +170,9 @@ class HostRun {
       execv(argv[0], argv.data());
       _exit(127);
     }
-    int status = 0;
-    const bool waited = child > 0 && waitpid(child, &status, 0) == child;
+    for (int i = 0; i < 2 && fullDisk; ++i) close(pipes[i][1]);
+    const int status = ExitStatus(child);
     for (int i = 0; i < 2 && fullDisk; ++i) {
-      close(pipes[i][1]);
       char buffer[4096];
       for (ssize_t n; (n = read(pipes[i][0], buffer, sizeof buffer)) > 0;) {
         if (write(i == 0 ? out : err, buffer, n) != n) break;
@@ -113,8 +181,7 @@ class HostRun {
     }
     close(out);
     close(err);
-    if (!waited) return -1;
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    return status;
   }
   std::string Out() const { return ReadFile(Path("out.txt")); }
   std::string Err() const { return ReadFile(Path("err.txt")); }
@@ -133,7 +200,7 @@ class HostRun {
   }
 
  private:
-  void Copy(const std::string& from, const std::string& name) const {
+  void Install(const std::string& from, const std::string& name) const {
     WriteFile(bin + "/" + name, ReadFile(from));
     chmod((bin + "/" + name).c_str(), 0755);
   }
