@@ -126,18 +126,6 @@ TEST(HostRun, RefusalsEndWithTheirMessageAndResultOne) {
   }
 }
 
-TEST(HostRun, MissingDestinationIsReportedOnStandardError) {
-  HostRun run({"p10_pavsuite"});
-  Lines options = run.Options({"pavsuite", "pavsuite", "5.0", "5.5"});
-  options[1] = "-D2:" + run.Path("nowhere");
-  EXPECT_EQ(1, run.Run(options));
-  // The checks still say why; the run's doors admit no log where no destination is.
-  EXPECT_EQ("Error: Destination directory does not exist:  " + run.Path("nowhere") +
-                "\nvxmigrate: cannot write the log " + run.Path("nowhere") +
-                "/vxmigrate.log: Operation not permitted\n",
-            run.Err());
-}
-
 TEST(HostRun, RunningReportingServerRefusesTheRunUntilItIsGone) {
   HostRun run({"p05_halsuite_obx"});
   auto server = std::make_unique<LiveProcess>();
