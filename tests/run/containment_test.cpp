@@ -29,7 +29,10 @@ struct Launch {
 pid_t StartHost(const Lines& options, const Launch& launch, const std::string& out) {
   Lines args = {launch.argv0};
   args.insert(args.end(), options.begin(), options.end());
-  return StartProcess(VXM_HOST_EXE, args, launch.cwd, out, "", launch.keepPath);
+  const int file = CreateFile(out);
+  const pid_t child = StartProcess(VXM_HOST_EXE, args, launch.cwd, file, file, launch.keepPath);
+  close(file);
+  return child;
 }
 
 // Waits for a file that another process makes; false after a minute.

@@ -16,6 +16,7 @@
 #include <csignal>
 #include <cstring>
 #include <filesystem>
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -49,20 +50,20 @@ inline Tree WithoutBookkeeping(Tree tree) {
   return tree;
 }
 
+// A file at path opened for writing, emptied; closed on exec.
+inline int CreateFile(const std::string& path) {
+  return open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
+}
+
 // Starts program with argument list args (args[0]: the name it sees) in folder cwd, standard
-// output to file out and standard error to err (to out when ""), its environment without PATH
-// unless keepPath; the child's pid.
+// output and error on descriptors out and err, its environment without PATH unless keepPath;
+// inChild, when given, runs in the child right before the exec. The child's pid.
 inline pid_t StartProcess(const std::string& program, Lines args, const std::string& cwd,
-                          const std::string& out, const std::string& err = "",
-                          bool keepPath = true) {
+                          int out, int err, bool keepPath = true,
+                          const std::function<bool()>& inChild = nullptr) {
   const pid_t child = fork();
   if (child != 0) return child;
-  auto create = [](const std::string& path) {
-    return open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
-  };
-  const int outFd = create(out), errFd = err.empty() ? outFd : create(err);
-  if (outFd < 0 || errFd < 0 || dup2(outFd, 1) < 0 || dup2(errFd, 2) < 0 ||
-      chdir(cwd.c_str()) != 0) {
+  if (dup2(out, 1) < 0 || dup2(err, 2) < 0 || chdir(cwd.c_str()) != 0 || (inChild && !inChild())) {
     _exit(126);
   }
   std::vector<char*> argv, env;
@@ -140,47 +141,31 @@ class HostRun {
   // exec); its exit status, -1 when it did not exit. fullDisk: no file may grow (every write fails
   // as on a full disk).
   int Run(const Lines& options, int uid = -1, bool fullDisk = false) const {
-    if (uid < 0 && !fullDisk) {
-      return ExitStatus(StartProcess(bin + "/vxmigrate", Args(options), root_.path(),
-                                     Path("out.txt"), Path("err.txt")));
-    }
-    Lines args = Args(options);
-    std::vector<char*> argv;
-    for (std::string& arg : args) argv.push_back(arg.data());
-    argv.push_back(nullptr);
-    int out = open(Path("out.txt").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
-    int err = open(Path("err.txt").c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0644);
-    // Under the file-size limit the output files could not grow either: the output goes through
-    // pipes (a few hundred bytes, well within a pipe's buffer) and is saved after the run.
-    int pipes[2][2] = {{-1, -1}, {-1, -1}};
+    const int files[2] = {CreateFile(Path("out.txt")), CreateFile(Path("err.txt"))};
+    // Under the file-size limit the output files could not grow either: the output then goes
+    // through pipes (a few hundred bytes, well within a pipe's buffer) and is saved after the run.
+    int pipes[2][2] = {{-1, files[0]}, {-1, files[1]}};
     if (fullDisk && (pipe2(pipes[0], O_CLOEXEC) != 0 || pipe2(pipes[1], O_CLOEXEC) != 0)) return -1;
-    pid_t child = fork();
-    if (child == 0) {
-      dup2(fullDisk ? pipes[0][1] : out, 1);
-      dup2(fullDisk ? pipes[1][1] : err, 2);
-      if (chdir(root_.path().c_str()) != 0 ||
-          (uid >= 0 && (setgroups(0, nullptr) != 0 || setgid(uid) != 0 || setuid(uid) != 0))) {
-        _exit(126);
+    const pid_t child = StartProcess(bin + "/vxmigrate", Args(options), root_.path(), pipes[0][1],
+                                     pipes[1][1], true, [&] {
+      if (uid >= 0 && (setgroups(0, nullptr) != 0 || setgid(uid) != 0 || setuid(uid) != 0)) {
+        return false;
       }
-      if (fullDisk) {
-        signal(SIGXFSZ, SIG_IGN);  // kept across exec: writes then fail with EFBIG
-        struct rlimit none = {0, 0};
-        setrlimit(RLIMIT_FSIZE, &none);
-      }
-      execv(argv[0], argv.data());
-      _exit(127);
-    }
+      if (!fullDisk) return true;
+      signal(SIGXFSZ, SIG_IGN);  // kept across exec: writes then fail with EFBIG
+      const struct rlimit none = {0, 0};
+      return setrlimit(RLIMIT_FSIZE, &none) == 0;
+    });
     for (int i = 0; i < 2 && fullDisk; ++i) close(pipes[i][1]);
     const int status = ExitStatus(child);
     for (int i = 0; i < 2 && fullDisk; ++i) {
       char buffer[4096];
       for (ssize_t n; (n = read(pipes[i][0], buffer, sizeof buffer)) > 0;) {
-        if (write(i == 0 ? out : err, buffer, n) != n) break;
+        if (write(files[i], buffer, n) != n) break;
       }
       close(pipes[i][0]);
     }
-    close(out);
-    close(err);
+    for (int file : files) close(file);
     return status;
   }
   std::string Out() const { return ReadFile(Path("out.txt")); }

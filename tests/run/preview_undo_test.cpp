@@ -3,6 +3,7 @@
 // exact tree from before a run, also after a run killed midway; the report shows a planted
 // conflict with both values and never a protected value in clear.
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
 #include <sys/stat.h>
@@ -129,7 +130,9 @@ TEST(Undo, RefusesNamingFilesChangedSinceTheRunUnlessForced) {
 // once the journal holds records lines, unless it ended first (then the run is undone whole).
 void KillWhenJournalHas(const std::string& folder, const Lines& args, const std::string& journal,
                         int records) {
-  const pid_t child = StartProcess(args[0], args, folder, "/dev/null");
+  const int null = open("/dev/null", O_WRONLY | O_CLOEXEC);
+  const pid_t child = StartProcess(args[0], args, folder, null, null);
+  close(null);
   ASSERT_GT(child, 0);
   // Polled for up to a minute (a loaded machine starts the host slowly).
   for (int i = 0; i < 60000; ++i) {
