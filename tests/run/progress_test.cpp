@@ -69,7 +69,8 @@ TEST(Progress, RewritesOneLineOnATerminalAndBlanksItBeforeTheSummary) {
   }
 }
 
-TEST(Progress, NothingWithQuietOrWhenStandardErrorIsAFile) {
+// Standard error in a file gets no progress either: HostReport's summary test expects it exact.
+TEST(Progress, NothingWithQuiet) {
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   int status = -1;
@@ -79,10 +80,6 @@ TEST(Progress, NothingWithQuietOrWhenStandardErrorIsAFile) {
   EXPECT_EQ(0, status) << seen;
   EXPECT_EQ(std::string::npos, seen.find(" files] ")) << seen;
   EXPECT_EQ(std::string::npos, seen.find('\r')) << seen;
-
-  ASSERT_EQ(0, run.Run(run.SampleOptions()));
-  EXPECT_EQ(std::string::npos, run.Err().find(" files] ")) << run.Err();
-  EXPECT_EQ(std::string::npos, run.Err().find('\r')) << run.Err();
 }
 
 }  // namespace
