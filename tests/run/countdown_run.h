@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
+#include <functional>
 #include <iterator>
 #include <map>
 #include <set>
@@ -27,15 +28,21 @@ namespace vxtest {
 // Every whole version a run put in place, by name below its destination, as Tree holds them.
 using Versions = std::map<std::string, std::set<std::string>>;
 
-// The shim in the hosts started while environment lives, writing the number of changes a run
-// made to countFile at a normal exit. The shim comes first in the host process, ahead of the
-// address sanitizer's runtime in the sanitized build, which must be told to accept that.
-inline void UseCountdown(ScopedEnvironment& environment, const std::string& countFile) {
+// run's result, run with the shim in the hosts it starts and settings (VXM_KILL_BEFORE, ...) in
+// their environment; the shim writes the number of changes a run made to countFile at a normal
+// exit. It comes first in the host process, ahead of the address sanitizer's runtime in the
+// sanitized build, which must be told to accept that.
+inline int UnderCountdown(const std::string& countFile,
+                          const std::map<std::string, std::string>& settings,
+                          const std::function<int()>& run) {
+  ScopedEnvironment environment;
   environment.Set("LD_PRELOAD", VXM_COUNTDOWN_SHIM);
   environment.Set("VXM_COUNT_FILE", countFile);
   const char* asan = getenv("ASAN_OPTIONS");
   environment.Set("ASAN_OPTIONS",
                   std::string(asan != nullptr ? asan : "") + ":verify_asan_link_order=0");
+  for (const auto& [name, value] : settings) environment.Set(name, value);
+  return run();
 }
 
 // The number a countdown run wrote to countFile; 0 when it wrote none.

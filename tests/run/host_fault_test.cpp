@@ -50,13 +50,8 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
 
   // The undisturbed run: its result, its exit status and how many changes it makes.
   installations.Reset();
-  int finishedStatus;
-  {
-    ScopedEnvironment environment;
-    UseCountdown(environment, countFile);
-    environment.Set("VXM_VERSIONS_DIR", versionsFolder);
-    finishedStatus = run.Run(kCommandFile);
-  }
+  const int finishedStatus = UnderCountdown(countFile, {{"VXM_VERSIONS_DIR", versionsFolder}},
+                                            [&] { return run.Run(kCommandFile); });
   const Versions versions = KeptVersions(versionsFolder, destination);
   ASSERT_EQ(0, finishedStatus) << run.Err();
   const Tree after = WithoutBookkeeping(TreeState(destination));
@@ -68,15 +63,11 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
     const int error = point % 2 == 1 ? ENOSPC : EIO;
     installations.Reset();
     std::remove(noteFile.c_str());
-    int status;
-    {
-      ScopedEnvironment environment;
-      UseCountdown(environment, run.Path("unused.txt"));
-      environment.Set("VXM_FAIL_AT", std::to_string(point));
-      environment.Set("VXM_FAIL_ERRNO", std::to_string(error));
-      environment.Set("VXM_FAULT_NOTE_FILE", noteFile);
-      status = run.Run(kCommandFile);
-    }
+    const int status = UnderCountdown(run.Path("unused.txt"),
+                                      {{"VXM_FAIL_AT", std::to_string(point)},
+                                       {"VXM_FAIL_ERRNO", std::to_string(error)},
+                                       {"VXM_FAULT_NOTE_FILE", noteFile}},
+                                      [&] { return run.Run(kCommandFile); });
     const auto [call, path] = FailedCall(noteFile);
     SCOPED_TRACE("change " + std::to_string(point) + " of " + std::to_string(total) + " failed (" +
                  call + " " + path + ", " + (error == ENOSPC ? "ENOSPC" : "EIO") + ")");
