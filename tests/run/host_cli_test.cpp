@@ -115,16 +115,9 @@ TEST(HostCommandLine, ExitStatusSaysHowTheRunEnded) {
     Lines options = run.Options(c.products);
     options.push_back("-PFLog:shop.wlp,ghost.wlp");
     EXPECT_EQ(c.status, run.Run(options)) << run.Err();
-    auto expand = [&](std::string text) {
-      for (const auto& mark : {std::make_pair("$BIN", run.bin), std::make_pair("$DST", run.dst)}) {
-        for (size_t at; (at = text.find(mark.first)) != std::string::npos;) {
-          text.replace(at, 4, mark.second);
-        }
-      }
-      return text;
-    };
-    EXPECT_TRUE(Has(run.Out(), expand(c.out))) << run.Out();
-    EXPECT_TRUE(Has(run.Err(), expand(c.err))) << run.Err();
+    const Tree marks = {{"$BIN", run.bin}, {"$DST", run.dst}};
+    EXPECT_TRUE(Has(run.Out(), Expand(c.out, marks))) << run.Out();
+    EXPECT_TRUE(Has(run.Err(), Expand(c.err, marks))) << run.Err();
   }
 }
 

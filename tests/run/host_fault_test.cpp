@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "run/countdown_run.h"
-#include "run/sample_run.h"
+#include "run/host_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {

@@ -99,8 +99,7 @@ TEST(HostReport, EveryFailedReadOrWriteNamesItsFile) {
     run.GiveTo(kNobody);
     chmod(run.Path(c.file).c_str(), c.mode);
     EXPECT_EQ(4, run.Run(run.SampleOptions(), kNobody)) << run.Err();
-    std::string error = c.error;
-    error.replace(error.find('$'), 4, error.find("$SRC") != std::string::npos ? run.src : run.dst);
+    const std::string error = Expand(c.error, {{"$SRC", run.src}, {"$DST", run.dst}});
     EXPECT_TRUE(Has(run.Err(), error + "\n")) << run.Err();
     EXPECT_TRUE(Has(run.Out(), "Errors:               " + std::to_string(c.errors) + "\n"))
         << run.Out();

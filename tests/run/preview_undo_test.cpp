@@ -22,7 +22,6 @@
 #include "migrate/installations_fixture.h"
 #include "migrate/run_record.h"
 #include "run/host_run.h"
-#include "run/sample_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {

@@ -12,7 +12,7 @@
 #include <string>
 #include <vector>
 
-#include "run/sample_run.h"
+#include "run/host_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
