@@ -1,10 +1,8 @@
-// Whole runs of the shipped Halden-to-OBX plug-in killed with SIGKILL right before one of their
-// file changes (a test-only LD_PRELOAD shim counts them down): whatever the point, every destination
-// file must be as before the run or exactly as after an uninterrupted one, and a second run must
-// reach the uninterrupted result with no temporary file left behind.
-// VXM_KILL_TEST_POINTS: how many kill points, spread evenly over the run (default 16; "all": every
-// change). VXM_KILL_TEST_FILES: a generated installation of about that many files (see
-// bench/make_installation.sh) instead of the shipped samples.
+// The shipped Halden-to-OBX plug-in's run killed with SIGKILL right before one of its file changes
+// (a test-only LD_PRELOAD shim counts them down): each destination file must be as before or as
+// after an uninterrupted run, and a re-run must finish with no temporary file left.
+// VXM_KILL_TEST_POINTS: how many points, spread evenly (default 16; "all"). VXM_KILL_TEST_FILES: a
+// generated installation of about that many files (bench/make_installation.sh) instead of samples.
 
 #include <gtest/gtest.h>
 

@@ -84,8 +84,6 @@ TEST(HostReport, EveryFailedReadOrWriteNamesItsFile) {
   } cases[] = {
       {"src/adviews.txt", 0, "Error: Unable to open file:   $SRC/adviews.txt", 1},
       {"dst/adviews.txt", 0444, "Error: Unable to write file:   $DST/adviews.txt", 1},
-      {"src/vxintra.txt", 0, "Error: Unable to open file:   $SRC/vxintra.txt", 1},
-      {"dst/vxintra.txt", 0444, "Error: Unable to write file:   $DST/vxintra.txt", 1},
       {"src/keywords.ini", 0, "Error: Unable to open file:   $SRC/keywords.ini", 1},
       {"dst/keywords.ini", 0, "Error: Unable to open file:   $DST/keywords.ini", 1},
       // Only the destination's profile folder is read-only: the readable source is not to blame.

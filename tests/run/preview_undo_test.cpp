@@ -27,20 +27,17 @@
 namespace vxtest {
 namespace {
 
-// The destination as a user sees it: every file's mode and bytes, with mtimes, and without the
-// runs' history.
-std::map<std::string, std::string> Installation(const std::string& folder, bool withTimes) {
-  std::map<std::string, std::string> tree = TreeState(folder);
-  for (auto it = tree.begin(); it != tree.end();) {
-    if (it->first.compare(0, 10, ".vxmigrate") == 0) {
-      it = tree.erase(it);
-      continue;
-    }
+// The destination as a user sees it: every file's mode and bytes, with mtimes when asked, and
+// without the runs' history.
+Tree Installation(const std::string& folder, bool withTimes) {
+  Tree tree;
+  for (const auto& [name, state] : TreeState(folder)) {
     struct stat st;
-    if (withTimes && lstat((folder + "/" + it->first).c_str(), &st) == 0) {
-      it->second += " @" + std::to_string(st.st_mtim.tv_sec) + "." + std::to_string(st.st_mtim.tv_nsec);
+    if (name.rfind(".vxmigrate", 0) == 0) continue;
+    tree[name] = state;
+    if (withTimes && lstat((folder + "/" + name).c_str(), &st) == 0) {
+      tree[name] += " @" + std::to_string(st.st_mtim.tv_sec) + "." + std::to_string(st.st_mtim.tv_nsec);
     }
-    ++it;
   }
   return tree;
 }
