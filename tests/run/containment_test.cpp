@@ -3,64 +3,29 @@
 // installations, the source must come out byte for byte as it went in, and a folder outside both
 // must stay untouched. Also: one run per destination, and plug-ins only from beside the host.
 
-#include <fcntl.h>
 #include <gtest/gtest.h>
-#include <sys/file.h>
 #include <sys/stat.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <chrono>
-#include <cstdlib>
-#include <cstring>
-#include <map>
+#include <filesystem>
 #include <string>
 #include <thread>
-#include <vector>
 
+#include "run/host_run.h"
 #include "support/test_files.h"
-
-extern char** environ;
 
 namespace vxtest {
 namespace {
 
-using Lines = std::vector<std::string>;
-using Tree = std::map<std::string, std::string>;
-
-// How the host is started: argv[0], the current folder, and whether PATH stays in the environment.
+// How the host is started: argv[0] ("": the host's path), the current folder, and whether PATH
+// stays in the environment.
 struct Launch {
-  std::string argv0 = VXM_HOST_EXE;
+  std::string argv0;
   std::string cwd = "/";
   bool keepPath = true;
 };
-
-// Starts the host with options; the child's pid. Standard output and error go to files.
-pid_t StartHost(const Lines& options, const Launch& launch, const std::string& out) {
-  pid_t pid = fork();
-  if (pid != 0) return pid;
-  int fd = open(out.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-  if (fd < 0 || chdir(launch.cwd.c_str()) != 0) _exit(126);
-  dup2(fd, 1);
-  dup2(fd, 2);
-  std::vector<char*> argv = {const_cast<char*>(launch.argv0.c_str())};
-  for (const std::string& option : options) argv.push_back(const_cast<char*>(option.c_str()));
-  argv.push_back(nullptr);
-  std::vector<char*> env;
-  for (char** e = environ; *e != nullptr; ++e) {
-    if (launch.keepPath || strncmp(*e, "PATH=", 5) != 0) env.push_back(*e);
-  }
-  env.push_back(nullptr);
-  execve(VXM_HOST_EXE, argv.data(), env.data());
-  _exit(127);
-}
-
-int Wait(pid_t pid) {
-  int status = 0;
-  waitpid(pid, &status, 0);
-  return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
 
 // Waits for a file that another process makes; false after a minute.
 bool AwaitFile(const std::string& path) {
@@ -71,45 +36,36 @@ bool AwaitFile(const std::string& path) {
   return false;
 }
 
-// Copies of the sample Halden (source) and OBX (destination) installations, and a folder outside
-// both that holds what an attacker would like to see carried or overwritten.
-class Samples {
-  TempDir root_;  // first: the paths below are made from it
-
+// Copies of the sample Halden (src) and OBX (dst) installations beside the host, and a folder
+// outside both that holds what an attacker would like to see carried or overwritten.
+class Samples : public HostRun {
  public:
-  const std::string halden = root_.Path("halden"), obx = root_.Path("obx");
-  const std::string outside = root_.Path("outside");
+  const std::string outside = Path("outside");
 
-  Samples() {
-    for (const char* name : {"halden", "obx"}) {
-      const std::string command =
-          std::string("cp -a '") + VXM_SOURCE_DIR + "/samples/" + name + "' '" + root_.Path(name) + "'";
-      EXPECT_EQ(0, system(command.c_str()));
-    }
+  Samples() : HostRun({"halden_to_obx"}) {
+    UseSamples();
     WriteFile(outside + "/secret.txt", "10.9.9.0,10.9.9.255,SECRET-DATA-RECORD\n");
     WriteFile(outside + "/secret.wlp", "[Profile]\nLogFilePassword=SECRET-PASSWORD\n");
     MakeDirs(outside + "/profiles");
   }
 
-  std::string Path(const std::string& relative) const { return root_.Path(relative); }
-  Lines Options(const std::string& destination) const {
-    return {"-D1:" + halden, "-D2:" + destination, "-P1:halsuite", "-P2:obx", "-V1:5.5",
-            "-V2:3.0"};
+  // Starts the sample run into destination; its standard output and error go to file out.
+  pid_t Start(const std::string& destination, const Launch& launch, const std::string& out) const {
+    Lines args = SampleOptions();
+    args[1] = "-D2:" + destination;
+    args.insert(args.begin(), launch.argv0.empty() ? bin + "/vxmigrate" : launch.argv0);
+    const int file = CreateFile(out);
+    const pid_t child = StartProcess(bin + "/vxmigrate", args, launch.cwd, file, file,
+                                     launch.keepPath);
+    close(file);
+    return child;
   }
-  int Run(const std::string& destination, const Launch& launch = Launch()) const {
-    return Wait(StartHost(Options(destination), launch, Path("out.txt")));
+  int RunInto(const std::string& destination, const Launch& launch = Launch()) const {
+    return ExitStatus(Start(destination, launch, Path("out.txt")));
   }
-  std::string Output() const { return ReadFile(Path("out.txt")); }
   void Link(const std::string& at, const std::string& to) const {
-    unlink(at.c_str());
+    std::filesystem::remove_all(at);
     ASSERT_EQ(0, symlink(to.c_str(), at.c_str())) << at;
-  }
-  // True when a file below folder holds text.
-  static bool AnyFileHolds(const std::string& folder, const std::string& text) {
-    for (const auto& [name, state] : TreeState(folder)) {
-      if (state.find(text) != std::string::npos) return true;
-    }
-    return false;
   }
 };
 
@@ -123,36 +79,36 @@ std::string ClimbTo(const std::string& target) {
 TEST(Containment, ADestinationThatReachesIntoTheSourceIsRefusedAndNothingIsWritten) {
   for (const char* route : {"link", "dots"}) {
     Samples s;
-    ASSERT_EQ(0, system(("cp -a '" + s.obx + "' '" + s.halden + "/obx2'").c_str()));
-    const Tree source = TreeState(s.halden);
-    std::string destination = s.outside + "/../halden/obx2";
+    std::filesystem::copy(s.dst, s.src + "/obx2", std::filesystem::copy_options::recursive);
+    const Tree source = TreeState(s.src);
+    std::string destination = s.outside + "/../src/obx2";
     if (std::string(route) == "link") {
-      s.Link(s.Path("lnk"), s.halden + "/obx2");
+      s.Link(s.Path("lnk"), s.src + "/obx2");
       destination = s.Path("lnk");
     }
-    EXPECT_EQ(1, s.Run(destination)) << route << s.Output();
-    EXPECT_EQ(source, TreeState(s.halden)) << route;
+    EXPECT_EQ(1, s.RunInto(destination)) << route << s.Out();
+    EXPECT_EQ(source, TreeState(s.src)) << route;
     EXPECT_NE(std::string::npos,
-              s.Output().find("Error: Destination directory cannot be child of source directory: " +
+              s.Out().find("Error: Destination directory cannot be child of source directory: " +
                               destination + "\n"))
-        << s.Output();
+        << s.Out();
   }
 }
 
 TEST(Containment, LinksInTheSourceToFilesElsewhereAreLeftOutAndNamed) {
   Samples s;
-  s.Link(s.halden + "/vxintra.txt", s.outside + "/secret.txt");
-  s.Link(s.halden + "/vxm_log/datfiles/shadow.wlp", s.outside + "/secret.wlp");
-  const Tree source = TreeState(s.halden), outside = TreeState(s.outside);
-  s.Run(s.obx);
-  EXPECT_FALSE(Samples::AnyFileHolds(s.obx, "SECRET"));
-  const Lines log = LogEntries(s.obx + "/vxmigrate.log");
+  s.Link(s.src + "/vxintra.txt", s.outside + "/secret.txt");
+  s.Link(s.src + "/vxm_log/datfiles/shadow.wlp", s.outside + "/secret.wlp");
+  const Tree source = TreeState(s.src), outside = TreeState(s.outside);
+  s.RunInto(s.dst);
+  for (const auto& [name, state] : TreeState(s.dst)) EXPECT_FALSE(Has(state, "SECRET")) << name;
+  const Lines log = LogEntries(s.dst + "/vxmigrate.log");
   for (const char* name : {"/vxintra.txt", "/vxm_log/datfiles/shadow.wlp"}) {
     const std::string line =
-        "Error: Refused to read a file that leads outside the installations: " + s.halden + name;
+        "Error: Refused to read a file that leads outside the installations: " + s.src + name;
     EXPECT_NE(log.end(), std::find(log.begin(), log.end(), line)) << line;
   }
-  EXPECT_EQ(source, TreeState(s.halden));
+  EXPECT_EQ(source, TreeState(s.src));
   EXPECT_EQ(outside, TreeState(s.outside));
 }
 
@@ -160,20 +116,20 @@ TEST(Containment, FoldersNamedInSettingsFilesCannotClimbOut) {
   for (const bool fromSource : {true, false}) {
     Samples s;
     const std::string escape = "profilesdir=" + ClimbTo(s.outside + "/profiles") + "\n";
-    std::string settings = ReadFile(s.obx + "/vxm_vxx/vxm_vxx.ini");
+    std::string settings = ReadFile(s.dst + "/vxm_vxx/vxm_vxx.ini");
     const size_t key = settings.find("profilesdir=");
     settings.replace(key, settings.find('\n', key) + 1 - key, fromSource ? "" : escape);
-    WriteFile(s.obx + "/vxm_vxx/vxm_vxx.ini", settings);
+    WriteFile(s.dst + "/vxm_vxx/vxm_vxx.ini", settings);
     if (fromSource) {
-      std::string old = ReadFile(s.halden + "/vxm_log/vxm_log.ini");
+      std::string old = ReadFile(s.src + "/vxm_log/vxm_log.ini");
       old.insert(old.find('\n', old.find("[Defaults]")) + 1, escape);
-      WriteFile(s.halden + "/vxm_log/vxm_log.ini", old);
+      WriteFile(s.src + "/vxm_log/vxm_log.ini", old);
     }
-    const Tree source = TreeState(s.halden), outside = TreeState(s.outside);
-    s.Run(s.obx);
+    const Tree source = TreeState(s.src), outside = TreeState(s.outside);
+    s.RunInto(s.dst);
     EXPECT_EQ(outside, TreeState(s.outside)) << fromSource;
-    EXPECT_EQ(source, TreeState(s.halden)) << fromSource;
-    const std::string log = ReadFile(s.obx + "/vxmigrate.log");
+    EXPECT_EQ(source, TreeState(s.src)) << fromSource;
+    const std::string log = ReadFile(s.dst + "/vxmigrate.log");
     EXPECT_NE(std::string::npos,
               log.find("Error: Refused a folder name that climbs out of its installation: "))
         << log;
@@ -182,51 +138,47 @@ TEST(Containment, FoldersNamedInSettingsFilesCannotClimbOut) {
 
 TEST(Containment, LinksInTheDestinationAreNeverWrittenThrough) {
   Samples s;
-  WriteFile(s.outside + "/keywords.ini", ReadFile(s.obx + "/keywords.ini"));
-  s.Link(s.obx + "/keywords.ini", s.outside + "/keywords.ini");
-  s.Link(s.obx + "/adviews.txt", s.halden + "/adviews.txt");
-  ASSERT_EQ(0, system(("rm -rf '" + s.obx + "/vxm_vxx/datfiles/profiles'").c_str()));
-  s.Link(s.obx + "/vxm_vxx/datfiles/profiles", s.outside + "/profiles");
-  const Tree source = TreeState(s.halden), outside = TreeState(s.outside);
-  s.Run(s.obx);
+  WriteFile(s.outside + "/keywords.ini", ReadFile(s.dst + "/keywords.ini"));
+  s.Link(s.dst + "/keywords.ini", s.outside + "/keywords.ini");
+  s.Link(s.dst + "/adviews.txt", s.src + "/adviews.txt");
+  s.Link(s.dst + "/vxm_vxx/datfiles/profiles", s.outside + "/profiles");
+  const Tree source = TreeState(s.src), outside = TreeState(s.outside);
+  s.RunInto(s.dst);
   EXPECT_EQ(outside, TreeState(s.outside));
-  EXPECT_EQ(source, TreeState(s.halden));
-  const std::string log = ReadFile(s.obx + "/vxmigrate.log");
+  EXPECT_EQ(source, TreeState(s.src));
+  const std::string log = ReadFile(s.dst + "/vxmigrate.log");
   EXPECT_NE(std::string::npos, log.find("Error: Refused to write outside the destination "
-                                        "installation: " + s.obx + "/vxm_vxx/datfiles/profiles/"))
+                                        "installation: " + s.dst + "/vxm_vxx/datfiles/profiles/"))
       << log;
 }
 
 TEST(Containment, ASecondRunOnTheSameDestinationIsRefusedWhileTheFirstCompletes) {
   const std::string script = "#!/bin/sh\ntouch started\nwhile [ ! -e go ]; do sleep 0.05; done\n";
   Samples reference;
-  WriteFile(reference.obx + "/go", "");
-  WriteFile(reference.obx + "/synchinstall.sh", script);
-  chmod((reference.obx + "/synchinstall.sh").c_str(), 0755);
-  ASSERT_EQ(0, reference.Run(reference.obx));
+  WriteFile(reference.dst + "/go", "");
+  WriteFile(reference.dst + "/synchinstall.sh", script);
+  chmod((reference.dst + "/synchinstall.sh").c_str(), 0755);
+  ASSERT_EQ(0, reference.RunInto(reference.dst));
 
   Samples s;
-  WriteFile(s.obx + "/synchinstall.sh", script);
-  chmod((s.obx + "/synchinstall.sh").c_str(), 0755);
-  const pid_t first = StartHost(s.Options(s.obx), Launch(), s.Path("first.txt"));
-  ASSERT_TRUE(AwaitFile(s.obx + "/started"));  // the first run holds the lock in its script
-  const Tree during = TreeState(s.obx);
-  EXPECT_EQ(5, s.Run(s.obx));
-  EXPECT_NE(std::string::npos, s.Output().find("another run is migrating into")) << s.Output();
-  EXPECT_EQ(during, TreeState(s.obx));
-  WriteFile(s.obx + "/go", "");
-  EXPECT_EQ(0, Wait(first));
-  Tree expected = TreeState(reference.obx), reached = TreeState(s.obx);
-  for (Tree* tree : {&expected, &reached}) {
-    for (const char* name : {"vxmigrate.log", "vxmigrate-report.json", "started"}) tree->erase(name);
-    // Each run's journal has its own times and inode numbers.
-    for (auto it = tree->begin(); it != tree->end();) {
-      it = it->first.compare(0, 10, ".vxmigrate") == 0 ? tree->erase(it) : std::next(it);
-    }
-  }
+  WriteFile(s.dst + "/synchinstall.sh", script);
+  chmod((s.dst + "/synchinstall.sh").c_str(), 0755);
+  const pid_t first = s.Start(s.dst, Launch(), s.Path("first.txt"));
+  ASSERT_TRUE(AwaitFile(s.dst + "/started"));  // the first run holds the lock in its script
+  const Tree during = TreeState(s.dst);
+  EXPECT_EQ(5, s.RunInto(s.dst));
+  EXPECT_NE(std::string::npos, s.Out().find("another run is migrating into")) << s.Out();
+  EXPECT_EQ(during, TreeState(s.dst));
+  WriteFile(s.dst + "/go", "");
+  EXPECT_EQ(0, ExitStatus(first));
+  // Each run's journal has its own times and inode numbers.
+  Tree expected = WithoutBookkeeping(TreeState(reference.dst));
+  Tree reached = WithoutBookkeeping(TreeState(s.dst));
+  expected.erase("started");
+  reached.erase("started");
   EXPECT_EQ(expected, reached);
-  EXPECT_EQ(LogEntries(reference.obx + "/vxmigrate.log").size(),
-            LogEntries(s.obx + "/vxmigrate.log").size());
+  EXPECT_EQ(LogEntries(reference.dst + "/vxmigrate.log").size(),
+            LogEntries(s.dst + "/vxmigrate.log").size());
 }
 
 TEST(Containment, PluginsComeOnlyFromBesideTheRealHost) {
@@ -234,24 +186,24 @@ TEST(Containment, PluginsComeOnlyFromBesideTheRealHost) {
   // A plug-in for the same products in the folder the host is started from, and a link to the host.
   MakeDirs(s.Path("cwd"));
   WriteFile(s.Path("cwd/aaa.so"), ReadFile(VXM_TEST_PLUGIN_DIR "/p05_halsuite_obx.so"));
-  s.Link(s.Path("vxmigrate"), VXM_HOST_EXE);
+  s.Link(s.Path("vxmigrate"), s.bin + "/vxmigrate");
   for (const Launch& launch : {Launch{"vxmigrate", s.Path("cwd"), false},
                                Launch{s.Path("vxmigrate"), s.Path("cwd"), true}}) {
-    ASSERT_EQ(0, s.Run(s.obx, launch)) << launch.argv0 << s.Output();
-    EXPECT_FALSE(FileExists(s.obx + "/plugin_calls.txt")) << launch.argv0;
+    ASSERT_EQ(0, s.RunInto(s.dst, launch)) << launch.argv0 << s.Out();
+    EXPECT_FALSE(FileExists(s.dst + "/plugin_calls.txt")) << launch.argv0;
     char real[4096];
-    ASSERT_NE(nullptr, realpath(VXM_HOST_EXE, real));
-    const Lines log = LogEntries(s.obx + "/vxmigrate.log");
+    ASSERT_NE(nullptr, realpath((s.bin + "/vxmigrate").c_str(), real));
+    const Lines log = LogEntries(s.dst + "/vxmigrate.log");
     ASSERT_GT(log.size(), 12u);
     EXPECT_EQ(std::string("VXMigrate Executable: ") + real, log[1]);
-    EXPECT_EQ(std::string::npos, ReadFile(s.obx + "/vxmigrate.log").find("No appropriate"));
+    EXPECT_EQ(std::string::npos, ReadFile(s.dst + "/vxmigrate.log").find("No appropriate"));
   }
 }
 
 TEST(Containment, AnEmptyDestinationWritesNothingInTheCurrentFolder) {
   Samples s;
   MakeDirs(s.Path("cwd"));
-  EXPECT_NE(0, s.Run("", Launch{VXM_HOST_EXE, s.Path("cwd"), true}));
+  EXPECT_NE(0, s.RunInto("", Launch{"", s.Path("cwd"), true}));
   EXPECT_TRUE(ListTree(s.Path("cwd")).empty());
 }
 

@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
+#include <functional>
 #include <iterator>
 #include <map>
 #include <set>
@@ -18,24 +19,30 @@
 #include <utility>
 #include <vector>
 
+#include "run/host_run.h"
 #include "support/process_state.h"
 #include "support/test_files.h"
 
 namespace vxtest {
 
-using Tree = std::map<std::string, std::string>;
 // Every whole version a run put in place, by name below its destination, as Tree holds them.
 using Versions = std::map<std::string, std::set<std::string>>;
 
-// The shim in the hosts started while environment lives, writing the number of changes a run
-// made to countFile at a normal exit. The shim comes first in the host process, ahead of the
-// address sanitizer's runtime in the sanitized build, which must be told to accept that.
-inline void UseCountdown(ScopedEnvironment& environment, const std::string& countFile) {
+// run's result, run with the shim in the hosts it starts and settings (VXM_KILL_BEFORE, ...) in
+// their environment; the shim writes the number of changes a run made to countFile at a normal
+// exit. It comes first in the host process, ahead of the address sanitizer's runtime in the
+// sanitized build, which must be told to accept that.
+inline int UnderCountdown(const std::string& countFile,
+                          const std::map<std::string, std::string>& settings,
+                          const std::function<int()>& run) {
+  ScopedEnvironment environment;
   environment.Set("LD_PRELOAD", VXM_COUNTDOWN_SHIM);
   environment.Set("VXM_COUNT_FILE", countFile);
   const char* asan = getenv("ASAN_OPTIONS");
   environment.Set("ASAN_OPTIONS",
                   std::string(asan != nullptr ? asan : "") + ":verify_asan_link_order=0");
+  for (const auto& [name, value] : settings) environment.Set(name, value);
+  return run();
 }
 
 // The number a countdown run wrote to countFile; 0 when it wrote none.
@@ -63,19 +70,6 @@ inline Versions KeptVersions(const std::string& folder, const std::string& desti
 inline bool IsTemporaryName(const std::string& relative) {
   const std::string name = relative.substr(relative.rfind('/') + 1);
   return fnmatch(".*.vxtmp.*", name.c_str(), 0) == 0;
-}
-
-// The run's own bookkeeping: its log, its report and its undo journal, which every run changes.
-inline bool IsBookkeeping(const std::string& name) {
-  return name == "vxmigrate.log" || name == "vxmigrate-report.json" ||
-         name.rfind(".vxmigrate", 0) == 0;
-}
-
-inline Tree WithoutBookkeeping(Tree tree) {
-  for (auto entry = tree.begin(); entry != tree.end();) {
-    entry = IsBookkeeping(entry->first) ? tree.erase(entry) : std::next(entry);
-  }
-  return tree;
 }
 
 // Names whose entry differs between the two trees, or that only one of them has.
@@ -139,41 +133,37 @@ inline std::vector<long> CountdownPoints(long total, const char* setting,
   return points;
 }
 
-// Two installations a run starts from, kept aside so that every run starts from the same bytes.
+// Two installations a run starts from, kept aside so that every run starts from the same bytes:
+// Reset puts fresh copies at liveSource and liveDestination.
 class PristineInstallations {
  public:
-  // Copies of source and destination are kept in aside; Reset puts them at liveSource and
-  // liveDestination.
   PristineInstallations(const std::string& source, const std::string& destination,
-                        const std::string& aside, std::string liveSource,
-                        std::string liveDestination)
-      : source_(aside + "/source"),
-        destination_(aside + "/destination"),
-        liveSource_(std::move(liveSource)),
-        liveDestination_(std::move(liveDestination)) {
-    namespace fs = std::filesystem;
-    MakeDirs(aside);
-    fs::copy(source, source_, fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    fs::copy(destination, destination_,
-             fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    sourceState_ = TreeState(source_);
-    destinationState_ = TreeState(destination_);
+                        const std::string& aside, const std::string& liveSource,
+                        const std::string& liveDestination)
+      : copies_{{aside + "/source", liveSource}, {aside + "/destination", liveDestination}} {
+    CopyTree(source, copies_[0].first);
+    CopyTree(destination, copies_[1].first);
+    sourceState_ = TreeState(copies_[0].first);
+    destinationState_ = TreeState(copies_[1].first);
   }
 
-  // Puts fresh copies of both installations in place of the run's source and destination.
   void Reset() const {
-    namespace fs = std::filesystem;
-    for (const auto& [from, to] :
-         {std::pair(source_, liveSource_), std::pair(destination_, liveDestination_)}) {
-      fs::remove_all(to);
-      fs::copy(from, to, fs::copy_options::recursive | fs::copy_options::copy_symlinks);
+    for (const auto& [kept, live] : copies_) {
+      std::filesystem::remove_all(live);
+      CopyTree(kept, live);
     }
   }
   const Tree& SourceState() const { return sourceState_; }
   const Tree& DestinationState() const { return destinationState_; }
 
  private:
-  const std::string source_, destination_, liveSource_, liveDestination_;
+  static void CopyTree(const std::string& from, const std::string& to) {
+    namespace fs = std::filesystem;
+    fs::create_directories(fs::path(to).parent_path());
+    fs::copy(from, to, fs::copy_options::recursive | fs::copy_options::copy_symlinks);
+  }
+
+  const std::pair<std::string, std::string> copies_[2];  // kept aside, live
   Tree sourceState_, destinationState_;
 };
 

@@ -12,8 +12,6 @@
 namespace vxtest {
 namespace {
 
-bool Has(const std::string& text, const std::string& part) { return text.find(part) != std::string::npos; }
-
 const char kHint[] = "Try 'vxmigrate --help' for the options.\n";
 
 TEST(HostCommandLine, EachCaseHasItsStatusAndTextsAndRefusalsWriteNothing) {
@@ -117,31 +115,27 @@ TEST(HostCommandLine, ExitStatusSaysHowTheRunEnded) {
     Lines options = run.Options(c.products);
     options.push_back("-PFLog:shop.wlp,ghost.wlp");
     EXPECT_EQ(c.status, run.Run(options)) << run.Err();
-    auto expand = [&](std::string text) {
-      for (const auto& mark : {std::make_pair("$BIN", run.bin), std::make_pair("$DST", run.dst)}) {
-        for (size_t at; (at = text.find(mark.first)) != std::string::npos;) {
-          text.replace(at, 4, mark.second);
-        }
-      }
-      return text;
-    };
-    EXPECT_TRUE(Has(run.Out(), expand(c.out))) << run.Out();
-    EXPECT_TRUE(Has(run.Err(), expand(c.err))) << run.Err();
+    const Tree marks = {{"$BIN", run.bin}, {"$DST", run.dst}};
+    EXPECT_TRUE(Has(run.Out(), Expand(c.out, marks))) << run.Out();
+    EXPECT_TRUE(Has(run.Err(), Expand(c.err, marks))) << run.Err();
   }
 }
 
-// A destination that is a file: the log cannot be made, so nothing runs.
-TEST(HostCommandLine, DestinationThatIsAFileIsRefusedBeforeTheRun) {
-  HostRun run({"p10_pavsuite"});
-  WriteFile(run.Path("file"), "not a folder\n");
-  Lines options = run.Options({"pavsuite", "pavsuite", "5.0", "5.5"});
-  options[1] = "-D2:" + run.Path("file");
-  EXPECT_EQ(1, run.Run(options));
-  EXPECT_EQ("Error: Destination directory does not exist:  " + run.Path("file") +
-                "\nvxmigrate: cannot write the log " + run.Path("file") +
-                "/vxmigrate.log: Operation not permitted\n",
-            run.Err());
-  EXPECT_EQ("not a folder\n", ReadFile(run.Path("file")));
+// A destination that is missing or a file: the checks say why, and the log cannot be made there.
+TEST(HostCommandLine, DestinationThatIsNoFolderIsRefusedBeforeTheRun) {
+  for (const char* name : {"nowhere", "file"}) {
+    HostRun run({"p10_pavsuite"});
+    const std::string destination = run.Path(name);
+    if (name == std::string("file")) WriteFile(destination, "not a folder\n");
+    Lines options = run.Options({"pavsuite", "pavsuite", "5.0", "5.5"});
+    options[1] = "-D2:" + destination;
+    EXPECT_EQ(1, run.Run(options));
+    EXPECT_EQ("Error: Destination directory does not exist:  " + destination +
+                  "\nvxmigrate: cannot write the log " + destination +
+                  "/vxmigrate.log: Operation not permitted\n",
+              run.Err());
+    EXPECT_EQ(name == std::string("file") ? "not a folder\n" : "<missing>", ReadFile(destination));
+  }
 }
 
 // A disk that takes nothing: the log is created but stays empty, so the run cannot end with 0.

@@ -1,15 +1,8 @@
-// Whole runs of each shipped plug-in over its sample installations in which one call that changes
-// a file fails, as on a full disk (ENOSPC) or a failing device (EIO), alternately: for every N from
-// 1 to the number of such calls in an undisturbed run, the N-th fails (a test-only LD_PRELOAD shim
-// counts them). Whatever the point, the run says so (an exit status other than 0, the failure on
-// standard error and, unless it was the log's own write that failed, an "Error: " entry in the
-// log), leaves every destination file as before or as after an undisturbed run and the source as
-// it was, cleans up its temporary files, and a run without the fault reaches the undisturbed
-// result. A file that a plug-in's sequence writes more than once (settings merged, then changed)
-// may also stop at one of the whole versions the undisturbed run put in place on its way; a run
-// that worked around the failure (an old file kept another way) and finished with the whole
-// result needs no report. VXM_FAULT_TEST_POINTS: "all" (the default) or how many points, spread evenly over the
-// run; the i386 build, which runs through an emulator, sets it to 40 (tests/CMakeLists.txt).
+// Whole runs of each shipped plug-in over its samples in which the N-th call that changes a file
+// fails, as on a full disk (ENOSPC) or a failing device (EIO) alternately, for every N of an
+// undisturbed run (a test-only LD_PRELOAD shim counts them; VXM_FAULT_TEST_POINTS: "all" or how
+// many, spread evenly). The run must say so, leave each destination file as before, as after, or
+// at a whole version the undisturbed run put in place, keep the source, and a re-run must finish.
 
 #include <errno.h>
 #include <gtest/gtest.h>
@@ -19,7 +12,7 @@
 #include <vector>
 
 #include "run/countdown_run.h"
-#include "run/sample_run.h"
+#include "run/host_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -27,30 +20,16 @@ namespace {
 
 const std::vector<std::string> kCommandFile = {"-cmd:./migcmd.ini"};
 
-// What the shim noted of the call it failed: its name and the path it would have changed.
-struct FailedCall {
-  std::string call, path;
-  bool known = false;
-};
-
-FailedCall ReadFailedCall(const std::string& noteFile) {
-  FailedCall failed;
+// What the shim noted of the call it failed: "<call>\t<path>\n"; both "" when it noted none.
+std::pair<std::string, std::string> FailedCall(const std::string& noteFile) {
   const std::string note = ReadFile(noteFile);
   const size_t tab = note.find('\t');
-  if (tab == std::string::npos) return failed;
-  failed.call = note.substr(0, tab);
-  failed.path = note.substr(tab + 1, note.find('\n') - tab - 1);
-  failed.known = true;
-  return failed;
+  if (tab == std::string::npos) return {"", ""};
+  return {note.substr(0, tab), note.substr(tab + 1, note.find('\n') - tab - 1)};
 }
 
 bool HasLine(const std::string& text, const std::string& start) {
   return text.rfind(start, 0) == 0 || text.find("\n" + start) != std::string::npos;
-}
-
-// Only a failed removal may leave a temporary file behind (the one it was removing).
-bool MayLeaveTemporaries(const FailedCall& failed) {
-  return failed.call == "unlink" || failed.call == "unlinkat";
 }
 
 int FailureCount() {
@@ -71,13 +50,8 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
 
   // The undisturbed run: its result, its exit status and how many changes it makes.
   installations.Reset();
-  int finishedStatus;
-  {
-    ScopedEnvironment environment;
-    UseCountdown(environment, countFile);
-    environment.Set("VXM_VERSIONS_DIR", versionsFolder);
-    finishedStatus = run.Run(kCommandFile);
-  }
+  const int finishedStatus = UnderCountdown(countFile, {{"VXM_VERSIONS_DIR", versionsFolder}},
+                                            [&] { return run.Run(kCommandFile); });
   const Versions versions = KeptVersions(versionsFolder, destination);
   ASSERT_EQ(0, finishedStatus) << run.Err();
   const Tree after = WithoutBookkeeping(TreeState(destination));
@@ -89,22 +63,17 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
     const int error = point % 2 == 1 ? ENOSPC : EIO;
     installations.Reset();
     std::remove(noteFile.c_str());
-    int status;
-    {
-      ScopedEnvironment environment;
-      UseCountdown(environment, run.Path("unused.txt"));
-      environment.Set("VXM_FAIL_AT", std::to_string(point));
-      environment.Set("VXM_FAIL_ERRNO", std::to_string(error));
-      environment.Set("VXM_FAULT_NOTE_FILE", noteFile);
-      status = run.Run(kCommandFile);
-    }
-    const FailedCall failed = ReadFailedCall(noteFile);
+    const int status = UnderCountdown(run.Path("unused.txt"),
+                                      {{"VXM_FAIL_AT", std::to_string(point)},
+                                       {"VXM_FAIL_ERRNO", std::to_string(error)},
+                                       {"VXM_FAULT_NOTE_FILE", noteFile}},
+                                      [&] { return run.Run(kCommandFile); });
+    const auto [call, path] = FailedCall(noteFile);
     SCOPED_TRACE("change " + std::to_string(point) + " of " + std::to_string(total) + " failed (" +
-                 failed.call + " " + failed.path + ", " + (error == ENOSPC ? "ENOSPC" : "EIO") +
-                 ")");
+                 call + " " + path + ", " + (error == ENOSPC ? "ENOSPC" : "EIO") + ")");
     ++injected;
     const int failuresBefore = FailureCount();
-    ASSERT_TRUE(failed.known) << "the run never reached the change";
+    ASSERT_FALSE(call.empty()) << "the run never reached the change";
 
     const Tree disturbed = TreeState(destination);
     // A failure the run worked around (a kept copy of an old file made another way) leaves the
@@ -118,7 +87,7 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
           << "nothing on standard error:\n" << err;
       const std::string logPath = destination + "/vxmigrate.log";
       // A run stopped before its log could be opened has only standard error to tell.
-      if (failed.path != logPath && FileExists(logPath)) {
+      if (path != logPath && FileExists(logPath)) {
         EXPECT_NE(std::string::npos, ReadFile(logPath).find("  Error: "))
             << "no \"Error: \" entry in the log";
       }
@@ -128,7 +97,8 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
         Misfits(installations.DestinationState(), after, disturbed, versions);
     EXPECT_TRUE(misfits.empty()) << "files neither as before nor as after the run:"
                                  << Listed(misfits);
-    if (!MayLeaveTemporaries(failed)) {
+    // Only a failed removal may leave a temporary file behind (the one it was removing).
+    if (call != "unlink" && call != "unlinkat") {
       EXPECT_EQ(std::vector<std::string>(), TemporaryFiles(disturbed)) << "temporary files left";
     }
     EXPECT_EQ(installations.SourceState(), TreeState(source)) << "the source changed";
@@ -143,10 +113,6 @@ TEST_P(HostFault, EveryFailedWriteIsReportedAndLeavesOldOrFinishedFiles) {
   printf("%s: %ld write-side calls in an undisturbed run, %ld fault points injected, %ld passed"
          " (%ld of them worked around by the run)\n",
          GetParam(), total, injected, passed, absorbedCount);
-  RecordProperty("write_side_calls", static_cast<int>(total));
-  RecordProperty("points_injected", static_cast<int>(injected));
-  RecordProperty("points_passed", static_cast<int>(passed));
-  RecordProperty("points_worked_around", static_cast<int>(absorbedCount));
 }
 
 INSTANTIATE_TEST_SUITE_P(ShippedPlugins, HostFault, testing::ValuesIn(kShippedPlugins),

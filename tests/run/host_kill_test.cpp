@@ -1,10 +1,8 @@
-// Whole runs of the shipped Halden-to-OBX plug-in killed with SIGKILL right before one of their
-// file changes (a test-only LD_PRELOAD shim counts them down): whatever the point, every destination
-// file must be as before the run or exactly as after an uninterrupted one, and a second run must
-// reach the uninterrupted result with no temporary file left behind.
-// VXM_KILL_TEST_POINTS: how many kill points, spread evenly over the run (default 16; "all": every
-// change). VXM_KILL_TEST_FILES: a generated installation of about that many files (see
-// bench/make_installation.sh) instead of the shipped samples.
+// The shipped Halden-to-OBX plug-in's run killed with SIGKILL right before one of its file changes
+// (a test-only LD_PRELOAD shim counts them down): each destination file must be as before or as
+// after an uninterrupted run, and a re-run must finish with no temporary file left.
+// VXM_KILL_TEST_POINTS: how many points, spread evenly (default 16; "all"). VXM_KILL_TEST_FILES: a
+// generated installation of about that many files (bench/make_installation.sh) instead of samples.
 
 #include <gtest/gtest.h>
 
@@ -14,7 +12,6 @@
 
 #include "run/countdown_run.h"
 #include "run/host_run.h"
-#include "support/process_state.h"
 #include "support/test_files.h"
 
 namespace vxtest {
@@ -35,9 +32,6 @@ PristineInstallations KeptInstallations(const HostRun& run) {
   return PristineInstallations(source, destination, run.Path("pristine"), run.src, run.dst);
 }
 
-// The host killed right before each of a run's file changes (a handful spread over the run here;
-// every one with VXM_KILL_TEST_POINTS=all): each destination file is as before or as after an
-// uninterrupted run, and a re-run finishes the job with no temporary file left.
 TEST(HostKill, EveryKillLeavesOldOrFinishedFilesAndARerunFinishesClean) {
   HostRun run({"halden_to_obx"});
   const PristineInstallations installations = KeptInstallations(run);
@@ -45,12 +39,8 @@ TEST(HostKill, EveryKillLeavesOldOrFinishedFilesAndARerunFinishesClean) {
 
   // The uninterrupted run: its result, its exit status and how many changes it makes.
   installations.Reset();
-  int finishedStatus;
-  {
-    ScopedEnvironment environment;
-    UseCountdown(environment, countFile);
-    finishedStatus = run.Run(run.SampleOptions());
-  }
+  const int finishedStatus =
+      UnderCountdown(countFile, {}, [&] { return run.Run(run.SampleOptions()); });
   ASSERT_GE(finishedStatus, 0) << run.Err();
   const Tree after = WithoutBookkeeping(TreeState(run.dst));
   const long total = CountedChanges(countFile);
@@ -60,12 +50,10 @@ TEST(HostKill, EveryKillLeavesOldOrFinishedFilesAndARerunFinishesClean) {
   for (long point : CountdownPoints(total, "VXM_KILL_TEST_POINTS", "16")) {
     SCOPED_TRACE("killed before change " + std::to_string(point) + " of " + std::to_string(total));
     installations.Reset();
-    {
-      ScopedEnvironment environment;
-      UseCountdown(environment, run.Path("unused.txt"));
-      environment.Set("VXM_KILL_BEFORE", std::to_string(point));
-      ASSERT_EQ(-1, run.Run(run.SampleOptions())) << "the run was not killed";
-    }
+    const std::string before = std::to_string(point);
+    ASSERT_EQ(-1, UnderCountdown(run.Path("unused.txt"), {{"VXM_KILL_BEFORE", before}},
+                                 [&] { return run.Run(run.SampleOptions()); }))
+        << "the run was not killed";
     const std::vector<std::string> misfits =
         Misfits(installations.DestinationState(), after, TreeState(run.dst));
     EXPECT_TRUE(misfits.empty()) << "files neither as before nor as after the run:"

@@ -22,26 +22,22 @@
 #include "migrate/installations_fixture.h"
 #include "migrate/run_record.h"
 #include "run/host_run.h"
-#include "run/sample_run.h"
 #include "support/test_files.h"
 
 namespace vxtest {
 namespace {
 
-// The destination as a user sees it: every file's mode and bytes, with mtimes, and without the
-// runs' history.
-std::map<std::string, std::string> Installation(const std::string& folder, bool withTimes) {
-  std::map<std::string, std::string> tree = TreeState(folder);
-  for (auto it = tree.begin(); it != tree.end();) {
-    if (it->first.compare(0, 10, ".vxmigrate") == 0) {
-      it = tree.erase(it);
-      continue;
-    }
+// The destination as a user sees it: every file's mode and bytes, with mtimes when asked, and
+// without the runs' history.
+Tree Installation(const std::string& folder, bool withTimes) {
+  Tree tree;
+  for (const auto& [name, state] : TreeState(folder)) {
     struct stat st;
-    if (withTimes && lstat((folder + "/" + it->first).c_str(), &st) == 0) {
-      it->second += " @" + std::to_string(st.st_mtim.tv_sec) + "." + std::to_string(st.st_mtim.tv_nsec);
+    if (name.rfind(".vxmigrate", 0) == 0) continue;
+    tree[name] = state;
+    if (withTimes && lstat((folder + "/" + name).c_str(), &st) == 0) {
+      tree[name] += " @" + std::to_string(st.st_mtim.tv_sec) + "." + std::to_string(st.st_mtim.tv_nsec);
     }
-    ++it;
   }
   return tree;
 }
@@ -112,23 +108,6 @@ TEST(Report, MasksStoredCredentialsByTheirFormAndShowsEveryOtherValue) {
       << run.Out();
 }
 
-TEST(Undo, GivesBackTheExactTreeAndKeepsTheUndoneLog) {
-  HostRun run({"halden_to_obx"});
-  run.UseSamples();
-  chmod((run.dst + "/keywords.ini").c_str(), 0600);
-  const auto before = Installation(run.dst, false);
-  ASSERT_EQ(0, run.Run(run.SampleOptions()));
-  ASSERT_NE(before, Installation(run.dst, false));
-  const std::string log = ReadFile(run.log);
-  ASSERT_EQ(0, run.Run({"--list-runs", run.dst}));
-  EXPECT_NE(std::string::npos, run.Out().find("000001  ")) << run.Out();
-  EXPECT_NE(std::string::npos, run.Out().find("status 0")) << run.Out();
-  ASSERT_EQ(0, run.Run({"--undo", run.dst})) << run.Err();
-  EXPECT_EQ(before, Installation(run.dst, false));
-  EXPECT_EQ(log, ReadFile(run.dst + "/.vxmigrate/runs/000001/vxmigrate.log"));
-  EXPECT_EQ(1, run.Run({"--undo", run.dst}));  // nothing left to undo
-}
-
 TEST(Undo, RefusesNamingFilesChangedSinceTheRunUnlessForced) {
   HostRun run({"halden_to_obx"});
   run.UseSamples();
@@ -145,43 +124,21 @@ TEST(Undo, RefusesNamingFilesChangedSinceTheRunUnlessForced) {
 
 // Starts the host with args (args[0] its path) in folder, its output thrown away; and kills it
 // once the journal holds records lines, unless it ended first (then the run is undone whole).
-void KillWhenJournalHas(const std::string& folder, Lines args, const std::string& journal,
+void KillWhenJournalHas(const std::string& folder, const Lines& args, const std::string& journal,
                         int records) {
-  pid_t child = fork();
-  if (child == 0) {
-    std::vector<char*> argv;
-    for (std::string& arg : args) argv.push_back(arg.data());
-    argv.push_back(nullptr);
-    int null = open("/dev/null", O_WRONLY);
-    if (null < 0 || dup2(null, 1) < 0 || dup2(null, 2) < 0 || chdir(folder.c_str()) != 0) _exit(126);
-    execv(argv[0], argv.data());
-    _exit(127);
-  }
+  const int null = open("/dev/null", O_WRONLY | O_CLOEXEC);
+  const pid_t child = StartProcess(args[0], args, folder, null, null);
+  close(null);
   ASSERT_GT(child, 0);
   // Polled for up to a minute (a loaded machine starts the host slowly).
-  int status = 0;
   for (int i = 0; i < 60000; ++i) {
     const std::string text = ReadFile(journal);
     if (std::count(text.begin(), text.end(), '\n') >= records) break;
-    if (waitpid(child, &status, WNOHANG) == child) return;
+    if (waitpid(child, nullptr, WNOHANG) == child) return;
     usleep(1000);
   }
   kill(child, SIGKILL);
-  waitpid(child, &status, 0);
-}
-
-// Killed at whatever point its journal has reached a few changes: undo still gives the tree back.
-TEST(Undo, TakesBackARunKilledMidway) {
-  for (int changes : {2, 5, 9}) {
-    HostRun run({"halden_to_obx"});
-    run.UseSamples();
-    const auto before = Installation(run.dst, false);
-    Lines args = {run.bin + "/vxmigrate"};
-    for (const std::string& option : run.SampleOptions()) args.push_back(option);
-    KillWhenJournalHas(run.Path(""), args, run.dst + "/.vxmigrate/runs/000001/journal", changes + 2);
-    ASSERT_EQ(0, run.Run({"--undo", run.dst})) << changes << run.Err();
-    EXPECT_EQ(before, Installation(run.dst, false)) << changes;
-  }
+  ExitStatus(child);
 }
 
 // Each shipped plug-in on copies of its samples, started with its command file's run as a whole
@@ -211,25 +168,34 @@ TEST_P(EveryShippedPlugin, PreviewLeavesTheDestinationAsItWasAndReportsWhatTheRu
   EXPECT_NE(std::string::npos, previewed.find("Files:\n  ")) << previewed;
 }
 
-TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeTheRun) {
+// Every file's mode is changed first: undo must give back modes as well as bytes.
+TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeTheRunAndKeepsTheUndoneLog) {
   SampleRun run(GetParam());
   const std::string dst = run.Path(run.destination);
+  for (const auto& [name, content] : FilesBelow(dst)) chmod((dst + "/" + name).c_str(), 0600);
   const auto before = Installation(dst, false);
   ASSERT_EQ(0, run.Run(run.RunOptions())) << run.Err();
   ASSERT_NE(before, Installation(dst, false));
+  const std::string log = ReadFile(dst + "/vxmigrate.log");
+  ASSERT_EQ(0, run.Run({"--list-runs", run.destination}));
+  EXPECT_TRUE(Has(run.Out(), "000001  ") && Has(run.Out(), "status 0")) << run.Out();
   ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
   EXPECT_EQ(before, Installation(dst, false));
+  EXPECT_EQ(log, ReadFile(dst + "/.vxmigrate/runs/000001/vxmigrate.log"));
+  EXPECT_EQ(1, run.Run({"--undo", run.destination}));  // nothing left to undo
 }
 
+// Killed at whatever point its journal has reached a few changes: undo still gives the tree back.
 TEST_P(EveryShippedPlugin, UndoGivesBackTheTreeFromBeforeARunKilledMidway) {
-  SampleRun run(GetParam());
-  const std::string dst = run.Path(run.destination);
-  const auto before = Installation(dst, false);
-  Lines args = {run.Path("bin/vxmigrate")};
-  for (const std::string& option : run.RunOptions()) args.push_back(option);
-  KillWhenJournalHas(run.Path(""), args, dst + "/.vxmigrate/runs/000001/journal", 6);
-  ASSERT_EQ(0, run.Run({"--undo", run.destination})) << run.Err();
-  EXPECT_EQ(before, Installation(dst, false));
+  for (int changes : {2, 4, 5, 9}) {
+    SampleRun run(GetParam());
+    const std::string dst = run.Path(run.destination);
+    const auto before = Installation(dst, false);
+    KillWhenJournalHas(run.Path(""), run.Args(run.RunOptions()),
+                       dst + "/.vxmigrate/runs/000001/journal", changes + 2);
+    ASSERT_EQ(0, run.Run({"--undo", run.destination})) << changes << run.Err();
+    EXPECT_EQ(before, Installation(dst, false)) << changes;
+  }
 }
 
 // What each plug-in's samples hold for the report: a value the customer tuned that the new

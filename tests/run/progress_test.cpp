@@ -19,8 +19,7 @@ namespace {
 // Runs the host on a pseudo-terminal of 80 columns (standard output and error both); what the
 // terminal received, byte for byte, and the exit status in *status.
 std::string RunOnTerminal(const HostRun& run, const Lines& options, int* status) {
-  std::vector<std::string> args = {run.bin + "/vxmigrate"};
-  args.insert(args.end(), options.begin(), options.end());
+  Lines args = run.Args(options);
   std::vector<char*> argv;
   for (std::string& arg : args) argv.push_back(arg.data());
   argv.push_back(nullptr);
@@ -42,9 +41,7 @@ std::string RunOnTerminal(const HostRun& run, const Lines& options, int* status)
     seen.append(buffer, static_cast<size_t>(n));
   }
   if (master >= 0) close(master);
-  *status = -1;
-  int wait = 0;
-  if (child > 0 && waitpid(child, &wait, 0) == child && WIFEXITED(wait)) *status = WEXITSTATUS(wait);
+  *status = ExitStatus(child);
   return seen;
 }
 
@@ -72,7 +69,8 @@ TEST(Progress, RewritesOneLineOnATerminalAndBlanksItBeforeTheSummary) {
   }
 }
 
-TEST(Progress, NothingWithQuietOrWhenStandardErrorIsAFile) {
+// Standard error in a file gets no progress either: HostReport's summary test expects it exact.
+TEST(Progress, NothingWithQuiet) {
   HostRun run({"halden_to_obx"});
   run.UseSamples();
   int status = -1;
@@ -82,10 +80,6 @@ TEST(Progress, NothingWithQuietOrWhenStandardErrorIsAFile) {
   EXPECT_EQ(0, status) << seen;
   EXPECT_EQ(std::string::npos, seen.find(" files] ")) << seen;
   EXPECT_EQ(std::string::npos, seen.find('\r')) << seen;
-
-  ASSERT_EQ(0, run.Run(run.SampleOptions()));
-  EXPECT_EQ(std::string::npos, run.Err().find(" files] ")) << run.Err();
-  EXPECT_EQ(std::string::npos, run.Err().find('\r')) << run.Err();
 }
 
 }  // namespace
