@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "migrate/settings_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {
@@ -24,12 +24,12 @@ TEST(DataFileMerge, GivesTheExpectedText) {
       {"", "a\n", "\na"}, {"a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
       {std::string("a\0b\n", 4), "a\n", std::string("a\0b\na", 5)}};
   for (const auto& c : cases) {
-    SettingsRun run;
+    Installations run;
     WriteFile(run.Src("dat/spiders.txt"), c[1]);
     WriteFile(run.Dst("dat/spiders.txt"), c[0]);
     EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\dat\\spiders.txt", "\\dat\\spiders.txt"));
     EXPECT_EQ(c[2], ReadFile(run.Dst("dat/spiders.txt"))) << c[0] << "|" << c[1];
-    EXPECT_EQ(std::vector<std::string>{"Data File Merged: \\dat\\spiders.txt"}, run.Logged());
+    EXPECT_EQ(Entries{"Data File Merged: \\dat\\spiders.txt"}, run.RunLog());
   }
 }
 
@@ -68,7 +68,7 @@ std::string ScanningMerge(std::string destination, const std::string& source) {
 }
 
 TEST(DataFileMerge, AgreesWithComparingEveryLine) {
-  SettingsRun run;
+  Installations run;
   std::mt19937 random(20240611);
   const std::string alphabet = "ab,,,\n\n\n \r\t";
   for (int round = 0; round < 800; ++round) {
@@ -85,7 +85,7 @@ TEST(DataFileMerge, AgreesWithComparingEveryLine) {
 }
 
 TEST(DataFileMerge, MissingOrUnwritableFiles) {
-  SettingsRun run;
+  Installations run;
   // Neither file: the copy fails.
   EXPECT_EQ(1, run.manager().DoMergeCSVFile("a.txt", "a.txt"));
   // No destination: the source is copied byte for byte.
@@ -100,21 +100,20 @@ TEST(DataFileMerge, MissingOrUnwritableFiles) {
   WriteFile(run.Src("d.txt"), "a\n");
   MakeDirs(run.Dst("d.txt"));
   EXPECT_EQ(1, run.manager().DoMergeCSVFile("d.txt", "d.txt"));
-  EXPECT_EQ((std::vector<std::string>{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}),
-            ListTree(run.Dst("")));
+  EXPECT_EQ((Entries{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}), ListTree(run.Dst()));
   // A source that is not there is no failure; the folder in the way is, and the log says so.
-  const std::string copying = "TXT file doesn't exist - file being copied: ";
-  EXPECT_EQ((std::vector<std::string>{copying + run.Src("a.txt"), copying + run.Src("dat/b.txt"),
-                                      "Error: Unable to write file:   " + run.Dst("d.txt")}),
-            run.Logged());
+  const std::string copying = "TXT file doesn't exist - file being copied: <src>/";
+  EXPECT_EQ((Entries{copying + "a.txt", copying + "dat/b.txt",
+                     "Error: Unable to write file:   <dst>/d.txt"}),
+            run.RunLog());
 }
 
 TEST(DataFileMerge, InPlaceRunReadsAndWritesNothing) {
-  SettingsRun run("pavsuite", "pavsuite", "5.5", "5.5", true);
+  Installations run({}, true);
   WriteFile(run.Dst("refs.txt"), "a");
   EXPECT_EQ(0, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
   EXPECT_EQ("a", ReadFile(run.Dst("refs.txt")));
-  EXPECT_TRUE(run.Logged().empty());
+  EXPECT_TRUE(run.RunLog().empty());
 }
 
 }  // namespace

@@ -19,8 +19,7 @@
 #include <vector>
 
 #include "crypt/protected_value.h"
-#include "migrate/manager.h"
-#include "support/test_files.h"
+#include "migrate/driver_fixture.h"
 
 namespace vxtest {
 
@@ -90,11 +89,7 @@ class Installations {
  private:
   vxMigrationManager& Start(Entries args) {
     args.insert(args.begin(), Join("bin/vxmigrate", ""));
-    std::vector<char*> argv;
-    for (std::string& arg : args) argv.push_back(&arg[0]);
-    argv.push_back(nullptr);
-    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data(),
-                                                    vxStringBase(args[0].c_str()));
+    manager_ = MakeManager(args);
     EXPECT_TRUE(manager_->IsValid());
     headerEntries_ = LogEntries(Dst("vxmigrate.log")).size();
     return *manager_;
