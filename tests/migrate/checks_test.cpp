@@ -13,7 +13,7 @@
 #include <utility>
 #include <vector>
 
-#include "migrate/driver_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {

@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include "migrate/driver_fixture.h"
+#include "migrate/installations_fixture.h"
 #include "support/live_process.h"
 
 namespace vxtest {
