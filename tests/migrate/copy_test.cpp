@@ -220,8 +220,8 @@ TEST(CopyProfilesOfTypes, CopiesEveryTypeWithDataFoldersUnlessFTSaysNo) {
   }
 }
 
-// In place the source is the destination: every copying operation answers 0 and leaves it alone,
-// whatever the arguments; nothing is copied, created, rewritten or logged.
+// In place the source is the destination: every copying operation (and the data-file merge) answers
+// 0 and leaves it alone, whatever the arguments; nothing is copied, created, rewritten or logged.
 TEST(InPlaceRun, EveryCopyingOperationDoesNothing) {
   Installations run({}, true);
   LayOutProfiles(run);
@@ -231,7 +231,7 @@ TEST(InPlaceRun, EveryCopyingOperationDoesNothing) {
   for (const char* f : {"p/categories.ini", "l/categories.ini"}) WriteFile(run.Src(f), categories);
   const Entries before = run.DestinationTree();
   vxMigrationManager& m = run.manager();
-  EXPECT_EQ(std::vector<int>(14, 0),
+  EXPECT_EQ(std::vector<int>(15, 0),
             (std::vector<int>{
                 m.CopyFilesOfType("wlp", 1), m.CopyFilesOfTypes("wlp", 1), m.CopyFiles("x", 0),
                 m.CopyAllFilesOfType("wlp", ""), m.CopyFilesInRelativeFolder("a", "wlp", 0),
@@ -240,7 +240,8 @@ TEST(InPlaceRun, EveryCopyingOperationDoesNothing) {
                 m.CopyScheduledEventFiles("p", "*.wlp", "wlp", "*"),
                 m.DoCopyLanguageFiles("lang", "new"), m.DoCopyLogProfiles("p", "*.wlp", "wlp", ""),
                 m.DoCopyLinkProfiles("l", "*.llp", "llp", ""),
-                m.DoCopyAlertProfiles("p", "*.wlp", "wlp", "")}));
+                m.DoCopyAlertProfiles("p", "*.wlp", "wlp", ""),
+                m.DoMergeCSVFile("p/a.wlp", "p/a.wlp")}));
   EXPECT_EQ(before, run.DestinationTree());
   EXPECT_EQ((Entries{profile, categories, categories}),
             run.ReadDst({"p/a.wlp", "p/categories.ini", "l/categories.ini"}));

@@ -90,13 +90,5 @@ TEST(DataFileMerge, MissingOrUnwritableFiles) {
             run.RunLog());
 }
 
-TEST(DataFileMerge, InPlaceRunReadsAndWritesNothing) {
-  Installations run({}, true);
-  WriteFile(run.Dst("refs.txt"), "a");
-  EXPECT_EQ(0, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_EQ("a", ReadFile(run.Dst("refs.txt")));
-  EXPECT_TRUE(run.RunLog().empty());
-}
-
 }  // namespace
 }  // namespace vxtest
