@@ -7,7 +7,6 @@
 #define VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 
 #include <gtest/gtest.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -132,11 +131,6 @@ inline Entries RunArgs(const std::string& p1, const std::string& p2, const std::
   Entries args = {"-P1:" + p1, "-P2:" + p2, "-V1:" + v1, "-V2:" + v2};
   args.insert(args.end(), extra.begin(), extra.end());
   return args;
-}
-
-inline unsigned int ModeOf(const std::string& path) {
-  struct stat st = {};
-  return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
 }
 
 // The previous generation's encoding of a clear text, as old profiles store credentials.
