@@ -34,16 +34,6 @@ inline std::unique_ptr<vxMigrationManager> MakeManager(Entries args) {
                                               vxStringBase(args[0].c_str()));
 }
 
-// A manager for products p1 -> p2, versions v1 -> v2, whose executable is "<root>/bin/vxmigrate".
-inline std::unique_ptr<vxMigrationManager> MakeRun(const TempDir& root, const std::string& p1,
-                                                   const std::string& p2, const std::string& v1,
-                                                   const std::string& v2) {
-  for (const char* folder : {"src", "dst", "bin"}) MakeDirs(root.Path(folder));
-  return MakeManager({root.Path("bin/vxmigrate"), "-D1:" + root.Path("src"),
-                      "-D2:" + root.Path("dst"), "-P1:" + p1, "-P2:" + p2, "-V1:" + v1,
-                      "-V2:" + v2});
-}
-
 class Installations {
  public:
   // A run from pavsuite 5.5 to pavsuite 5.5 with the further options of extra ("-FT:N",
