@@ -91,7 +91,8 @@ TEST(Checks, CompareMajorAndMinorOfOneProductOnly) {
            {"pavsuite", "pavsuite", "5.1.3", "5.1.0", "0"}, {"pavsuite", "pavsuite", "6.0", "5.9", "1"},
            {"halsuite", "obx", "6.0", "5.0", "0"}}) {
     Installations run(RunArgs(c[0], c[1], c[2], c[3]));
-    EXPECT_EQ(std::stoi(c[4]), run.manager().DoCheckMigrateValidity()) << ::testing::PrintToString(c);
+    EXPECT_EQ(std::stoi(c[4]), run.manager().DoCheckMigrateValidity())
+        << ::testing::PrintToString(c);
   }
 }
 

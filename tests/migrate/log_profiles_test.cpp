@@ -41,7 +41,8 @@ TEST(DoCopyLogProfiles, CopiesTheSelectionWithItsDataFoldersAndReportsUnknownNam
             run.DestinationTree());
   EXPECT_EQ("from an earlier run", ReadFile(run.Dst("p/web_vxmigrate.dat/h")));
   const std::string copy = ReadFile(run.Dst("p/sales_vxmigrate.wlp"));
-  const std::string user = Value(copy, "LogFileUsername"), password = Value(copy, "LogFilePassword");
+  const std::string user = Value(copy, "LogFileUsername");
+  const std::string password = Value(copy, "LogFilePassword");
   EXPECT_EQ((Entries{"logreader", "s3cr3t&pw"}), (Entries{Decrypted(user), Decrypted(password)}));
   EXPECT_EQ(head + "LogFileUsername=" + user + "\r\nLogFilePassword=" + password + tail, copy);
   EXPECT_EQ((Entries{"Error: Selected profile not found: ghost.wlp",
@@ -80,8 +81,8 @@ TEST(DoCopyLogProfiles, SplitsTheHomePageIntoFolderAndPage) {
   }
 }
 
-// Protected and empty credentials are written back unchanged. A binary profile, or one whose credential is too long to protect, is
-// logged and left exactly as copied.
+// Protected and empty credentials are written back unchanged. A binary profile, or one whose
+// credential is too long to protect, is logged and left exactly as copied.
 TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTheyAre) {
   Installations run;
   const std::string binary("[Profile]\nLogFilePassword=x\n\0\x01\x02", 31);

@@ -44,14 +44,13 @@ TEST(ObxProfiles, WithoutDataFoldersTheCopiesReportOnDemand) {
   ObxRun run("", {"-FT:N"});
   run.WriteProfiles();
   EXPECT_EQ(run.manager().DoCopyOBXProfiles(), 0);
-  const std::string to = run.Dst("vxm_vxx/datfiles/");
-  EXPECT_EQ(run.RunLog(),
-            (Entries{"Profile copied: <dst>/vxm_vxx/datfiles/profiles/intranet_vxmigrate.wlp",
-                   "Profile copied: <dst>/vxm_vxx/datfiles/profiles/shop_vxmigrate.wlp"}));
-  EXPECT_EQ(ListTree(to),
+  const std::string to = "vxm_vxx/datfiles/profiles/";
+  EXPECT_EQ(run.RunLog(), (Entries{"Profile copied: <dst>/" + to + "intranet_vxmigrate.wlp",
+                                   "Profile copied: <dst>/" + to + "shop_vxmigrate.wlp"}));
+  EXPECT_EQ(ListTree(run.Dst("vxm_vxx/datfiles")),
             (Entries{"profiles", "profiles/intranet_vxmigrate.wlp", "profiles/shop_vxmigrate.wlp"}));
-  EXPECT_EQ(ReadFile(to + "profiles/shop_vxmigrate.wlp"), "[profile]\nName=Shop\nondemandreports=0\n");
-  EXPECT_EQ(ReadFile(to + "profiles/intranet_vxmigrate.wlp"), "[profile]\nondemandreports=1\n");
+  EXPECT_EQ(run.ReadDst({to + "shop_vxmigrate.wlp", to + "intranet_vxmigrate.wlp"}),
+            (Entries{"[profile]\nName=Shop\nondemandreports=0\n", "[profile]\nondemandreports=1\n"}));
 }
 
 // The source's profile folder must lie inside its installation ("" when the value is refused).

@@ -42,7 +42,8 @@ TEST(ServerChecks, PidFileDecidesWhetherTheServerRuns) {
            {"", 1}}) {
     Installations run(RunArgs("tqrs", "tqrs", "3.0", "3.0"));
     if (content != "<none>") WriteFile(run.Dst("tqrs.pid"), content);
-    EXPECT_EQ(running, run.manager().CheckEngineRunning(21, vxVersionDescriptor("3.0"), 0)) << content;
+    EXPECT_EQ(running, run.manager().CheckEngineRunning(21, vxVersionDescriptor("3.0"), 0))
+        << content;
     EXPECT_EQ(running == 1, LogEntries(run.Dst("vxmigrate.log")).back() == kEngineRuns);
   }
 }
