@@ -92,10 +92,7 @@ TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTh
   WriteFile(run.Src("p/a.wlp"), binary);
   WriteFile(run.Src("p/b.wlp"), tooLong);
   WriteFile(run.Src("p/sample.wlp"), "[Profile]\n");
-  vxStringBase password(LegacyEncoded("pw").c_str());
-  run.manager().DoConvertEncryptedValue(password);
-  ASSERT_EQ("pw", Decrypted(password.str()));  // a protected value
-  const std::string own = "[Profile]\nLogFilePassword=" + password.str() + "\nHomePagePassword=\n";
+  const std::string own = "[Profile]\nLogFilePassword=" + Protected("pw") + "\nHomePagePassword=\n";
   WriteFile(run.Dst("p/own.wlp"), own);
   run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "sample.wlp");
 
