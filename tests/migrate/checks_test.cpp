@@ -112,24 +112,21 @@ TEST(VersionRanges, AcceptInclusiveBoundsAndReportAMissingFile) {
   }
 }
 
+// Two spellings of one folder are one installation: nothing may be copied onto itself.
 TEST(RunQuestions, InPlaceAndInline) {
   TempDir root;
   MakeDirs(root.Path("same"));
-  auto inPlace = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + root.Path("same"),
-                              "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.5"});
-  EXPECT_TRUE(inPlace->IsInPlaceMigrate() && inPlace->IsInlineMigrate());
-  EXPECT_EQ(root.Path("same/vxm_log/vxm_log.ini"),
-            inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
+  ASSERT_EQ(0, symlink(root.Path("same").c_str(), root.Path("alias").c_str()));
+  for (const std::string& other : {root.Path("same"), root.Path("same/"), root.Path("alias")}) {
+    auto inPlace = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + other,
+                                "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.5"});
+    EXPECT_TRUE(inPlace->IsInPlaceMigrate() && inPlace->IsInlineMigrate()) << other;
+    EXPECT_EQ(0, inPlace->DoCheckMigrateValidity()) << other;
+    EXPECT_EQ(root.Path("same/vxm_log/vxm_log.ini"),
+              inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
+  }
   Installations sideBySide(RunArgs("log", "log", "5.5", "6.0"));  // another major number
   EXPECT_FALSE(sideBySide.manager().IsInPlaceMigrate() || sideBySide.manager().IsInlineMigrate());
-  // Two spellings of one folder are one installation: nothing may be copied onto itself.
-  ASSERT_EQ(0, symlink(root.Path("same").c_str(), root.Path("alias").c_str()));
-  for (const std::string& other : {root.Path("same/"), root.Path("alias")}) {
-    auto spelt = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + other, "-P1:log",
-                              "-P2:log", "-V1:6.0", "-V2:6.5"});
-    EXPECT_TRUE(spelt->IsInPlaceMigrate()) << other;
-    EXPECT_EQ(0, spelt->DoCheckMigrateValidity()) << other;
-  }
 }
 
 // The log replaces a link in its place instead of writing through it; the install script runs in
