@@ -15,11 +15,10 @@
 #include "migrate/installations_fixture.h"
 #include "support/test_files.h"
 
+namespace vxtest {
 namespace {
 
 namespace fs = std::filesystem;
-using vxtest::ReadFile;
-using vxtest::WriteFile;
 using Tree = std::map<std::string, std::string>;
 
 std::string ExpandCredentials(std::string text) {
@@ -28,7 +27,7 @@ std::string ExpandCredentials(std::string text) {
     const size_t colon = text.find(':', at), end = text.find('}', at);
     const std::string plain = text.substr(colon + 1, end - colon - 1);
     text.replace(at, end + 1 - at,
-                 text[at + 1] == 'l' ? vxtest::LegacyEncoded(plain) : vxtest::Protected(plain));
+                 text[at + 1] == 'l' ? LegacyEncoded(plain) : Protected(plain));
   }
   return text;
 }
@@ -36,7 +35,7 @@ std::string ExpandCredentials(std::string text) {
 // Every file below folder by relative name; a data folder's with their credentials expanded.
 Tree FilesBelow(const std::string& folder, bool data = false) {
   Tree files;
-  for (const std::string& name : vxtest::ListTree(folder)) {
+  for (const std::string& name : ListTree(folder)) {
     if (fs::is_directory(folder + "/" + name)) continue;
     const std::string text = ReadFile(folder + "/" + name);
     files[name] = data ? ExpandCredentials(text) : text;
@@ -50,12 +49,12 @@ std::string DataPath(const std::string& name) {
 Tree Data(const std::string& folder) { return FilesBelow(DataPath(folder), true); }
 
 // A data folder's Halden installation (version 5.5 of product) and its OBX installation (version).
-class Conversion : public vxtest::Installations {
+class Conversion : public Installations {
  public:
   explicit Conversion(const std::string& data, const std::string& version = "3.0",
                       const std::vector<std::string>& extra = {},
                       const std::string& product = "halsuite")
-      : Installations(vxtest::RunArgs(product, "obx", "5.5", version, extra)) {
+      : Installations(RunArgs(product, "obx", "5.5", version, extra)) {
     for (const auto& [name, text] : Data(data + "/halden")) WriteFile(Src(name), text);
     for (const auto& [name, text] : Data(data + "/obx")) WriteFile(Dst(name), text);
   }
@@ -111,7 +110,7 @@ TEST(EditionConversion, WholeInstallation) {
 TEST(EditionConversion, OnlySelectedProfilesTravel) {
   Conversion run("installation", "3.0", {"-PFLog:shop.wlp"});
   run.Converter().DoHaldenToOBXProfileFileMigrate();
-  EXPECT_EQ(vxtest::ListTree(run.Dst("vxm_vxx/datfiles/profiles")),
+  EXPECT_EQ(ListTree(run.Dst("vxm_vxx/datfiles/profiles")),
             std::vector<std::string>{"shop_vxmigrate.wlp"});
 }
 
@@ -249,7 +248,7 @@ TEST(EditionFailures, MissingStandardTemplateConvertsNoTemplate) {
   Conversion run("installation");
   fs::remove(run.Dst("vxm_vxx/CompleteSummary.wct"));
   run.Converter().DoHaldenToOBXTemplateFileMigrate();
-  EXPECT_FALSE(vxtest::FileExists(run.Dst("vxm_vxx/Weekly_vxmigrate.wct")));
+  EXPECT_FALSE(FileExists(run.Dst("vxm_vxx/Weekly_vxmigrate.wct")));
   EXPECT_EQ(run.NewLog(), ReadFile(DataPath("installation/without_standard_template.log")));
 }
 
@@ -269,7 +268,8 @@ TEST(EditionFailures, ProfilesNeedTheServerSettingsAndTheirFolder) {
   EXPECT_EQ(run.Converter().DoHaldenToOBXProfileFileMigrate(), 0);
   fs::remove(run.Dst("vxm_vxx/vxm_vxx.ini"));
   EXPECT_EQ(run.Converter().DoHaldenToOBXProfileFileMigrate(), 1);
-  EXPECT_EQ(vxtest::ListTree(run.Dst("vxm_vxx/datfiles/profiles")), std::vector<std::string>{});
+  EXPECT_EQ(ListTree(run.Dst("vxm_vxx/datfiles/profiles")), std::vector<std::string>{});
 }
 
 }  // namespace
+}  // namespace vxtest

@@ -13,7 +13,7 @@
 #include <utility>
 #include <vector>
 
-#include "migrate/driver_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {
@@ -90,68 +90,63 @@ TEST(Checks, CompareMajorAndMinorOfOneProductOnly) {
   for (const std::vector<std::string>& c : std::vector<std::vector<std::string>>{
            {"pavsuite", "pavsuite", "5.1.3", "5.1.0", "0"}, {"pavsuite", "pavsuite", "6.0", "5.9", "1"},
            {"halsuite", "obx", "6.0", "5.0", "0"}}) {
-    TempDir root;
-    EXPECT_EQ(std::stoi(c[4]), MakeRun(root, c[0], c[1], c[2], c[3])->DoCheckMigrateValidity())
+    Installations run(RunArgs(c[0], c[1], c[2], c[3]));
+    EXPECT_EQ(std::stoi(c[4]), run.manager().DoCheckMigrateValidity())
         << ::testing::PrintToString(c);
   }
 }
 
 TEST(VersionRanges, AcceptInclusiveBoundsAndReportAMissingFile) {
-  TempDir root;
-  auto manager = MakeRun(root, "halsuite", "obx", "5.5", "3.0");
+  Installations run(RunArgs("halsuite", "obx", "5.5", "3.0"));
   vxStringBase halsuite("halsuite"), obx("obx");
-  EXPECT_EQ(2, manager->DoCheckVersions(halsuite, obx));
-  EXPECT_EQ("Error: Unable to open file:   " + root.Path("bin/vxmigrate.ini"),
-            LogEntries(root.Path("dst/vxmigrate.log")).back());
-  for (const auto& [ranges, result] : std::vector<std::pair<std::string, int>>{
+  EXPECT_EQ(2, run.manager().DoCheckVersions(halsuite, obx));
+  const std::string ranges = run.Root() + "/bin/vxmigrate.ini";
+  EXPECT_EQ("Error: Unable to open file:   " + ranges, run.RunLog().back());
+  for (const auto& [text, result] : std::vector<std::pair<std::string, int>>{
            {"[HalSuite]\nLow=5.5\nHigh=6.0\n[obx]\nlow=2.0\nhigh=3.0\n", 0},
            {"[halsuite]\nLow=5.6\nHigh=6.0\n[obx]\nLow=2.0\nHigh=3.0\n", 1},
            // A section without "High" admits no real version: its bound reads as 0.0.0.
            {"[halsuite]\nLow=5.0\n[obx]\nLow=2.0\nHigh=3.0\n", 1}}) {
-    WriteFile(root.Path("bin/vxmigrate.ini"), ranges);
-    EXPECT_EQ(result, manager->DoCheckVersions(halsuite, obx)) << ranges;
+    WriteFile(ranges, text);
+    EXPECT_EQ(result, run.manager().DoCheckVersions(halsuite, obx)) << text;
   }
 }
 
+// Two spellings of one folder are one installation: nothing may be copied onto itself.
 TEST(RunQuestions, InPlaceAndInline) {
   TempDir root;
   MakeDirs(root.Path("same"));
-  auto inPlace = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + root.Path("same"),
-                              "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.5"});
-  EXPECT_TRUE(inPlace->IsInPlaceMigrate() && inPlace->IsInlineMigrate());
-  EXPECT_EQ(root.Path("same/vxm_log/vxm_log.ini"),
-            inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
-  auto sideBySide = MakeRun(root, "log", "log", "5.5", "6.0");  // another major number
-  EXPECT_FALSE(sideBySide->IsInPlaceMigrate() || sideBySide->IsInlineMigrate());
-  // Two spellings of one folder are one installation: nothing may be copied onto itself.
   ASSERT_EQ(0, symlink(root.Path("same").c_str(), root.Path("alias").c_str()));
-  for (const std::string& other : {root.Path("same/"), root.Path("alias")}) {
-    auto spelt = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + other, "-P1:log",
-                              "-P2:log", "-V1:6.0", "-V2:6.5"});
-    EXPECT_TRUE(spelt->IsInPlaceMigrate()) << other;
-    EXPECT_EQ(0, spelt->DoCheckMigrateValidity()) << other;
+  for (const std::string& other : {root.Path("same"), root.Path("same/"), root.Path("alias")}) {
+    auto inPlace = MakeManager({"vxmigrate", "-D1:" + root.Path("same"), "-D2:" + other,
+                                "-P1:log", "-P2:log", "-V1:6.0", "-V2:6.5"});
+    EXPECT_TRUE(inPlace->IsInPlaceMigrate() && inPlace->IsInlineMigrate()) << other;
+    EXPECT_EQ(0, inPlace->DoCheckMigrateValidity()) << other;
+    EXPECT_EQ(root.Path("same/vxm_log/vxm_log.ini"),
+              inPlace->GetFullSourceFilename("\\vxm_log\\vxm_log.ini").str());
   }
+  Installations sideBySide(RunArgs("log", "log", "5.5", "6.0"));  // another major number
+  EXPECT_FALSE(sideBySide.manager().IsInPlaceMigrate() || sideBySide.manager().IsInlineMigrate());
 }
 
 // The log replaces a link in its place instead of writing through it; the install script runs in
 // the destination and the current folder comes back afterwards.
 TEST(RunSequence, TheLogReplacesALinkAndTheFolderComesBackAfterTheScript) {
-  TempDir root;
-  WriteFile(root.Path("src/keep.txt"), "customer data\n");
-  MakeDirs(root.Path("dst"));
-  ASSERT_EQ(0, symlink(root.Path("src/keep.txt").c_str(), root.Path("dst/vxmigrate.log").c_str()));
-  auto manager = MakeRun(root, "log", "log", "6.0", "6.5");
-  EXPECT_EQ("customer data\n", ReadFile(root.Path("src/keep.txt")));
+  Installations run(RunArgs("log", "log", "6.0", "6.5"));
+  WriteFile(run.Src("keep.txt"), "customer data\n");
+  ASSERT_EQ(0, symlink(run.Src("keep.txt").c_str(), run.Dst("vxmigrate.log").c_str()));
+  vxMigrationManager& manager = run.manager();
+  EXPECT_EQ("customer data\n", ReadFile(run.Src("keep.txt")));
   struct stat st;
-  ASSERT_EQ(0, lstat(root.Path("dst/vxmigrate.log").c_str(), &st));
+  ASSERT_EQ(0, lstat(run.Dst("vxmigrate.log").c_str(), &st));
   EXPECT_TRUE(S_ISREG(st.st_mode));
-  EXPECT_EQ(11u, LogEntries(root.Path("dst/vxmigrate.log")).size());  // the header
-  WriteFile(root.Path("dst/synchinstall.sh"), "#!/bin/sh\npwd > ran_in.txt\n");
-  chmod(root.Path("dst/synchinstall.sh").c_str(), 0755);
+  EXPECT_EQ(11u, LogEntries(run.Dst("vxmigrate.log")).size());  // the header
+  WriteFile(run.Dst("synchinstall.sh"), "#!/bin/sh\npwd > ran_in.txt\n");
+  chmod(run.Dst("synchinstall.sh").c_str(), 0755);
   const std::filesystem::path before = std::filesystem::current_path();
-  EXPECT_EQ(0, manager->DoMigration());
+  EXPECT_EQ(0, manager.DoMigration());
   EXPECT_EQ(before, std::filesystem::current_path());
-  EXPECT_EQ(root.Path("dst") + "\n", ReadFile(root.Path("dst/ran_in.txt")));
+  EXPECT_EQ(run.Dst() + "\n", ReadFile(run.Dst("ran_in.txt")));
 }
 
 }  // namespace

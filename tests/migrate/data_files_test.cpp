@@ -8,33 +8,15 @@
 #include <string>
 #include <vector>
 
-#include "migrate/settings_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {
 
-TEST(DataFileMerge, GivesTheExpectedText) {
-  const std::string cases[][3] = {  // destination, source, merged
-      {"x\na,b,c\n", "a,b\n", "x\na,b,c\n"},       // the record's fields begin a line
-      {"a,b\n", "a,b,c\n", "a,b\na,b,c"},          // the line's fields begin the record
-      {"a\n", "x\n\ny\n", "a\nx"},                 // the first empty line ends the merge
-      {"a\n", "x\nx,1\nx\n", "a\nx\nx,1"},         // a repeated record is added once
-      {"a", "b", "a\nb"},                          // a line feed before the first added line
-      // An empty destination gains a line feed; CRLF lines stay, added lines end in a line feed.
-      {"", "a\n", "\na"}, {"a,b\r\nc\r\n", "a,b\r\nd\r\n", "a,b\r\nc\nd"},
-      {std::string("a\0b\n", 4), "a\n", std::string("a\0b\na", 5)}};
-  for (const auto& c : cases) {
-    SettingsRun run;
-    WriteFile(run.Src("dat/spiders.txt"), c[1]);
-    WriteFile(run.Dst("dat/spiders.txt"), c[0]);
-    EXPECT_EQ(0, run.manager().DoMergeCSVFile("\\dat\\spiders.txt", "\\dat\\spiders.txt"));
-    EXPECT_EQ(c[2], ReadFile(run.Dst("dat/spiders.txt"))) << c[0] << "|" << c[1];
-    EXPECT_EQ(std::vector<std::string>{"Data File Merged: \\dat\\spiders.txt"}, run.Logged());
-  }
-}
-
 // The literal reading of the merge: every record compared with every line of the text as it
-// stands, the whole text stripped before each append. The indexed merge must agree with it.
+// stands, the whole text stripped before each append (so one line feed goes before the first added
+// record, and an empty text gains one), the first empty record ending the merge. The indexed merge
+// must agree with it.
 std::vector<std::string> Split(const std::string& text, char separator) {
   std::vector<std::string> parts;
   size_t start = 0;
@@ -68,9 +50,9 @@ std::string ScanningMerge(std::string destination, const std::string& source) {
 }
 
 TEST(DataFileMerge, AgreesWithComparingEveryLine) {
-  SettingsRun run;
+  Installations run;
   std::mt19937 random(20240611);
-  const std::string alphabet = "ab,,,\n\n\n \r\t";
+  const std::string alphabet("ab,,,\n\n\n \r\t\0", 12);  // CRLF lines and NUL bytes too
   for (int round = 0; round < 800; ++round) {
     std::string texts[2];  // destination, source: up to 24 characters each
     for (std::string& text : texts) {
@@ -85,7 +67,7 @@ TEST(DataFileMerge, AgreesWithComparingEveryLine) {
 }
 
 TEST(DataFileMerge, MissingOrUnwritableFiles) {
-  SettingsRun run;
+  Installations run;
   // Neither file: the copy fails.
   EXPECT_EQ(1, run.manager().DoMergeCSVFile("a.txt", "a.txt"));
   // No destination: the source is copied byte for byte.
@@ -100,21 +82,12 @@ TEST(DataFileMerge, MissingOrUnwritableFiles) {
   WriteFile(run.Src("d.txt"), "a\n");
   MakeDirs(run.Dst("d.txt"));
   EXPECT_EQ(1, run.manager().DoMergeCSVFile("d.txt", "d.txt"));
-  EXPECT_EQ((std::vector<std::string>{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}),
-            ListTree(run.Dst("")));
+  EXPECT_EQ((Entries{"c.txt", "d.txt", "dat", "dat/b.txt", "vxmigrate.log"}), ListTree(run.Dst()));
   // A source that is not there is no failure; the folder in the way is, and the log says so.
-  const std::string copying = "TXT file doesn't exist - file being copied: ";
-  EXPECT_EQ((std::vector<std::string>{copying + run.Src("a.txt"), copying + run.Src("dat/b.txt"),
-                                      "Error: Unable to write file:   " + run.Dst("d.txt")}),
-            run.Logged());
-}
-
-TEST(DataFileMerge, InPlaceRunReadsAndWritesNothing) {
-  SettingsRun run("pavsuite", "pavsuite", "5.5", "5.5", true);
-  WriteFile(run.Dst("refs.txt"), "a");
-  EXPECT_EQ(0, run.manager().DoMergeCSVFile("refs.txt", "refs.txt"));
-  EXPECT_EQ("a", ReadFile(run.Dst("refs.txt")));
-  EXPECT_TRUE(run.Logged().empty());
+  const std::string copying = "TXT file doesn't exist - file being copied: <src>/";
+  EXPECT_EQ((Entries{copying + "a.txt", copying + "dat/b.txt",
+                     "Error: Unable to write file:   <dst>/d.txt"}),
+            run.RunLog());
 }
 
 }  // namespace

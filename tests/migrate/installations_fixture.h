@@ -1,13 +1,12 @@
 // A source and a destination installation in a fresh temporary folder with a real manager over
-// them, for the tests of the copying, merging and profile operations: the log entries and files
-// those operations wrote, with the two folders written "<src>" and "<dst>" so that expectations
-// read as plain texts; and the credential forms old and new profiles hold.
+// them, for the tests of the run checks and of the copying, merging and profile operations: the
+// log entries and files those operations wrote, with the two folders written "<src>" and "<dst>"
+// so that expectations read as plain texts; and the credential forms old and new profiles hold.
 
 #ifndef VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 #define VXMIGRATE_TESTS_MIGRATE_INSTALLATIONS_FIXTURE_H_
 
 #include <gtest/gtest.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -25,6 +24,15 @@
 namespace vxtest {
 
 using Entries = std::vector<std::string>;
+
+// A manager over args, whose executable (plug-ins, "vxmigrate.ini") is args[0].
+inline std::unique_ptr<vxMigrationManager> MakeManager(Entries args) {
+  std::vector<char*> argv;
+  for (std::string& arg : args) argv.push_back(&arg[0]);
+  argv.push_back(nullptr);
+  return std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data(),
+                                              vxStringBase(args[0].c_str()));
+}
 
 class Installations {
  public:
@@ -90,11 +98,7 @@ class Installations {
  private:
   vxMigrationManager& Start(Entries args) {
     args.insert(args.begin(), Join("bin/vxmigrate", ""));
-    std::vector<char*> argv;
-    for (std::string& arg : args) argv.push_back(&arg[0]);
-    argv.push_back(nullptr);
-    manager_ = std::make_unique<vxMigrationManager>(static_cast<int>(args.size()), argv.data(),
-                                                    vxStringBase(args[0].c_str()));
+    manager_ = MakeManager(args);
     EXPECT_TRUE(manager_->IsValid());
     headerEntries_ = LogEntries(Dst("vxmigrate.log")).size();
     return *manager_;
@@ -117,11 +121,6 @@ inline Entries RunArgs(const std::string& p1, const std::string& p2, const std::
   Entries args = {"-P1:" + p1, "-P2:" + p2, "-V1:" + v1, "-V2:" + v2};
   args.insert(args.end(), extra.begin(), extra.end());
   return args;
-}
-
-inline unsigned int ModeOf(const std::string& path) {
-  struct stat st = {};
-  return lstat(path.c_str(), &st) == 0 ? (st.st_mode & 07777) : 0;
 }
 
 // The previous generation's encoding of a clear text, as old profiles store credentials.

@@ -17,9 +17,20 @@ void LayOutLogProfiles(const Installations& run) {
                     "p/sales.dat/h", "p/sales.dat/old/h", "p/support.dat/h", "p/web.dat/h"});
 }
 
+// The value of key in a profile with CRLF line ends.
+std::string Value(const std::string& profile, const std::string& key) {
+  const size_t at = profile.find("\n" + key + "=") + key.size() + 2;
+  return profile.substr(at, profile.find('\r', at) - at);
+}
+
+// The old credentials arrive as protected values of the same clear texts, the rest of the profile
+// as it was.
 TEST(DoCopyLogProfiles, CopiesTheSelectionWithItsDataFoldersAndReportsUnknownNames) {
   Installations run({"-PFLog:sales.wlp, WEB.WLP, ghost.wlp,ghost.wlp"});
   LayOutLogProfiles(run);
+  const std::string head = "[Profile]\r\nName=Sales\r\n", tail = "\r\n[Logs]\r\nLog1=ftp://h/a\r\n";
+  WriteFile(run.Src("p/sales.wlp"), head + "LogFileUsername=" + LegacyEncoded("logreader") +
+                                        "\r\nLogFilePassword=" + LegacyEncoded("s3cr3t&pw") + tail);
   WriteFile(run.Dst("p/web_vxmigrate.dat/h"), "from an earlier run");
   EXPECT_EQ(0, run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "sample.wlp"));
 
@@ -28,8 +39,12 @@ TEST(DoCopyLogProfiles, CopiesTheSelectionWithItsDataFoldersAndReportsUnknownNam
                      "p/sales_vxmigrate.wlp", "p/web_vxmigrate.dat", "p/web_vxmigrate.dat/h",
                      "p/web_vxmigrate.wlp"}),
             run.DestinationTree());
-  EXPECT_EQ((Entries{"from an earlier run", "p/sales.wlp"}),
-            run.ReadDst({"p/web_vxmigrate.dat/h", "p/sales_vxmigrate.wlp"}));
+  EXPECT_EQ("from an earlier run", ReadFile(run.Dst("p/web_vxmigrate.dat/h")));
+  const std::string copy = ReadFile(run.Dst("p/sales_vxmigrate.wlp"));
+  const std::string user = Value(copy, "LogFileUsername");
+  const std::string password = Value(copy, "LogFilePassword");
+  EXPECT_EQ((Entries{"logreader", "s3cr3t&pw"}), (Entries{Decrypted(user), Decrypted(password)}));
+  EXPECT_EQ(head + "LogFileUsername=" + user + "\r\nLogFilePassword=" + password + tail, copy);
   EXPECT_EQ((Entries{"Error: Selected profile not found: ghost.wlp",
                      "File copied:  <dst>/p/sales_vxmigrate.wlp",
                      "File copied:  <dst>/p/web_vxmigrate.wlp",
@@ -66,9 +81,8 @@ TEST(DoCopyLogProfiles, SplitsTheHomePageIntoFolderAndPage) {
   }
 }
 
-// Protected and empty credentials are written back unchanged (how old ones are protected, the
-// road of one file shows). A binary profile, or one whose credential is too long to protect, is
-// logged and left exactly as copied.
+// Protected and empty credentials are written back unchanged. A binary profile, or one whose
+// credential is too long to protect, is logged and left exactly as copied.
 TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTheyAre) {
   Installations run;
   const std::string binary("[Profile]\nLogFilePassword=x\n\0\x01\x02", 31);
@@ -78,10 +92,7 @@ TEST(DoCopyLogProfiles, LeavesProtectedCredentialsAndProfilesItCannotRewriteAsTh
   WriteFile(run.Src("p/a.wlp"), binary);
   WriteFile(run.Src("p/b.wlp"), tooLong);
   WriteFile(run.Src("p/sample.wlp"), "[Profile]\n");
-  vxStringBase password(LegacyEncoded("pw").c_str());
-  run.manager().DoConvertEncryptedValue(password);
-  ASSERT_EQ("pw", Decrypted(password.str()));  // a protected value
-  const std::string own = "[Profile]\nLogFilePassword=" + password.str() + "\nHomePagePassword=\n";
+  const std::string own = "[Profile]\nLogFilePassword=" + Protected("pw") + "\nHomePagePassword=\n";
   WriteFile(run.Dst("p/own.wlp"), own);
   run.manager().DoCopyLogProfiles("p", "*.wlp", "wlp", "sample.wlp");
 

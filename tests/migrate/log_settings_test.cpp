@@ -9,41 +9,41 @@
 #include <string>
 #include <vector>
 
-#include "migrate/settings_fixture.h"
+#include "migrate/installations_fixture.h"
 
 namespace vxtest {
 namespace {
 
 const char kLogSettings[] = "vxm_log/vxm_log.ini";
 const char kConverted[] = "New-style cookie created in vxm_log.ini";
+// A pavsuite run from 5.0 to 5.5, across the cookie change.
+const Entries kUpgrade = RunArgs("pavsuite", "pavsuite", "5.0", "5.5");
 
-TEST(MainSettingsMerge, MergesTheOldFileOrItsInPlaceBackupThenConvertsCookies) {
-  for (bool inPlace : {false, true}) {
-    SettingsRun run("pavsuite", "pavsuite", "5.0", "5.5", inPlace);
-    const std::string old = inPlace ? run.Dst("vantix.vxinibak") : run.Src("vantix.ini");
-    WriteFile(old, "[Main]\r\nLanguage=German\r\nPort=81\r\n[Old]\r\nA=1\r\n");
-    WriteFile(run.Dst("vantix.ini"), "; new\r\n[Main]\r\nPort=8080\r\n");
-    WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
-    EXPECT_EQ(0, run.manager().DoVantixINIMerge());
-    // The new value wins; the old file's other settings are added.
-    EXPECT_EQ("; new\r\n[Main]\r\nPort=8080\r\nLanguage=German\r\n[Old]\r\nA=1\r\n",
-              ReadFile(run.Dst("vantix.ini")));
-    EXPECT_EQ((std::vector<std::string>{"INI file merged: " + old, kConverted}), run.Logged());
-  }
+// In place the old file is the installer's backup. The new value wins; the old file's other
+// settings are added, as the log_to_log sample run shows side by side.
+TEST(MainSettingsMerge, MergesTheInPlaceBackupThenConvertsCookies) {
+  Installations run(kUpgrade, true);
+  WriteFile(run.Dst("vantix.vxinibak"), "[Main]\r\nLanguage=German\r\nPort=81\r\n[Old]\r\nA=1\r\n");
+  WriteFile(run.Dst("vantix.ini"), "; new\r\n[Main]\r\nPort=8080\r\n");
+  WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
+  EXPECT_EQ(0, run.manager().DoVantixINIMerge());
+  EXPECT_EQ("; new\r\n[Main]\r\nPort=8080\r\nLanguage=German\r\n[Old]\r\nA=1\r\n",
+            ReadFile(run.Dst("vantix.ini")));
+  EXPECT_EQ((Entries{"INI file merged: <src>/vantix.vxinibak", kConverted}), run.RunLog());
 }
 
 TEST(MainSettingsMerge, MissingFilesAreNotCreatedAndMissingDestinationTakesACopy) {
-  SettingsRun run;
+  Installations run(kUpgrade);
   EXPECT_EQ(0, run.manager().DoVantixINIMerge());
   EXPECT_EQ(1, run.manager().DoVXMLogINIChange());
   EXPECT_EQ(1, run.manager().DoTableLimitINIChange());
-  EXPECT_EQ(std::vector<std::string>{"vxmigrate.log"}, ListTree(run.Dst("")));
+  EXPECT_EQ(Entries{"vxmigrate.log"}, ListTree(run.Dst()));
   WriteFile(run.Src("vantix.ini"), "[Main]\nPort=81\n");
   WriteFile(run.Dst(kLogSettings), "[Cookie]\nEnable=1\n");
   EXPECT_EQ(0, run.manager().DoVantixINIMerge());
   EXPECT_EQ("[Main]\nPort=81\n", ReadFile(run.Dst("vantix.ini")));
-  const std::string copied = "INI file doesn't exist - file being copied: " + run.Src("vantix.ini");
-  EXPECT_EQ((std::vector<std::string>{copied, kConverted}), run.Logged());
+  EXPECT_EQ((Entries{"INI file doesn't exist - file being copied: <src>/vantix.ini", kConverted}),
+            run.RunLog());
 }
 
 // "[Cookie]" and the given lines, each "|" standing for the line end under test.
@@ -67,11 +67,11 @@ TEST(CookieConversion, GivesTheNumberedDefinitionInTheFilesOwnLineEnds) {
   };
   for (const auto& c : cases) {
     for (const char* eol : {"\n", "\r\n"}) {
-      SettingsRun run;
+      Installations run(kUpgrade);
       WriteFile(run.Dst(kLogSettings), CookieFile(c[0], eol));
       EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
       EXPECT_EQ(CookieFile(c[1] ? c[1] : c[0], eol), ReadFile(run.Dst(kLogSettings)));
-      EXPECT_EQ(std::vector<std::string>(c[1] ? 1 : 0, kConverted), run.Logged());
+      EXPECT_EQ(Entries(c[1] ? 1 : 0, kConverted), run.RunLog());
     }
   }
 }
@@ -86,10 +86,10 @@ TEST(CookieConversion, OnlyFromBeforeToAfterTheMiddleOfALine) {
   const std::string old = "; cookie settings\r\n[Cookie]\r\nEnable = 1\r\nCookieString=SID\r\n";
   for (const auto& c : cases) {
     SCOPED_TRACE(std::string(c[0]) + " " + c[2] + " -> " + c[1] + " " + c[3]);
-    SettingsRun run(c[0], c[1], c[2], c[3]);
+    Installations run(RunArgs(c[0], c[1], c[2], c[3]));
     WriteFile(run.Dst(kLogSettings), old);
     EXPECT_EQ(0, run.manager().DoVXMLogINIChange());
-    EXPECT_EQ(std::vector<std::string>(c[4] ? 1 : 0, kConverted), run.Logged());
+    EXPECT_EQ(Entries(c[4] ? 1 : 0, kConverted), run.RunLog());
     // Saved without change, the file stays byte for byte as it was.
     EXPECT_EQ(c[4] != nullptr, old != ReadFile(run.Dst(kLogSettings)));
   }
@@ -106,7 +106,7 @@ TEST(TableLimit, IsTheNextThousandAboveTheTopCountUnlessAlreadySet) {
       {"MaxTopCount=5000\r\n[MaxTableSizes]\r\nTopCompanies=200", nullptr},
   };
   for (const auto& c : cases) {
-    SettingsRun run;
+    Installations run(kUpgrade);
     const std::string text = std::string("[Defaults]\r\n") + c[0] + "\r\n";
     WriteFile(run.Dst(kLogSettings), text);
     EXPECT_EQ(0, run.manager().DoTableLimitINIChange());
@@ -116,7 +116,7 @@ TEST(TableLimit, IsTheNextThousandAboveTheTopCountUnlessAlreadySet) {
 }
 
 TEST(KeywordMerge, KeepsNumbersUpdatesKnownEnginesAndAppendsNewOnes) {
-  SettingsRun run;
+  Installations run(kUpgrade);
   WriteFile(run.Src("keywords.ini"),
             "[SearchEngines]\r\nEngine1=AltaVista\r\nEngine2=Google\r\nEngine3=\r\n"
             "[AltaVista]\r\nDomain=altavista.com\r\nQuery=q\r\n"
@@ -133,7 +133,7 @@ TEST(KeywordMerge, KeepsNumbersUpdatesKnownEnginesAndAppendsNewOnes) {
             "Charset=utf-8\nLegacy=1\n\n[Bing]\nDomain=bing.com\nQuery=q\n"
             "[AltaVista]\nDomain=altavista.com\nQuery=q\n",
             ReadFile(run.Dst("keywords.ini")));
-  EXPECT_EQ(std::vector<std::string>{"keywords.ini merged"}, run.Logged());
+  EXPECT_EQ(Entries{"keywords.ini merged"}, run.RunLog());
 }
 
 TEST(KeywordMerge, RefusesWithoutEnginesOnEitherSide) {
@@ -141,12 +141,12 @@ TEST(KeywordMerge, RefusesWithoutEnginesOnEitherSide) {
   const char* const cases[][2] = {  // source, destination; null: no file
       {nullptr, engines}, {engines, nullptr}, {"[A]\nx=1\n", engines}, {engines, "[B]\nx=1\n"}};
   for (const auto& c : cases) {
-    SettingsRun run;
+    Installations run(kUpgrade);
     if (c[0] != nullptr) WriteFile(run.Src("keywords.ini"), c[0]);
     if (c[1] != nullptr) WriteFile(run.Dst("keywords.ini"), c[1]);
     EXPECT_EQ(1, run.manager().DoKeywordINIMerge());
     EXPECT_EQ(c[1] != nullptr ? c[1] : "<missing>", ReadFile(run.Dst("keywords.ini")));
-    EXPECT_TRUE(run.Logged().empty());
+    EXPECT_TRUE(run.RunLog().empty());
   }
 }
 

@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include "migrate/driver_fixture.h"
+#include "migrate/installations_fixture.h"
 #include "support/live_process.h"
 
 namespace vxtest {
@@ -18,17 +18,17 @@ const char kEngineRuns[] =
     "Error: Cannot migrate while Tradequill Engine Server is running - shut down to migrate";
 
 TEST(ReadPid, ReadsTheLeadingNumberOfTheFirstNineteenBytes) {
-  TempDir root;
-  auto manager = MakeRun(root, "pavsuite", "pavsuite", "5.0", "5.5");
+  Installations run;
+  vxMigrationManager& manager = run.manager();
   for (const auto& [content, pid] : std::vector<std::pair<const char*, int>>{
            {"  4321\n", 4321}, {"garbage", 0}, {"", 0}, {"0000000000000000001234", 1}}) {
-    WriteFile(root.Path("pid"), content);
-    EXPECT_EQ(pid, manager->readPid(root.Path("pid").c_str())) << content;
+    WriteFile(run.Src("pid"), content);
+    EXPECT_EQ(pid, manager.readPid(run.Src("pid").c_str())) << content;
   }
-  EXPECT_EQ(-1, manager->readPid(root.Path("missing").c_str()));
-  EXPECT_EQ(-1, manager->readPid(root.path().c_str()));  // a folder cannot be read
-  EXPECT_FALSE(manager->sendNullSignal(-1));
-  EXPECT_TRUE(manager->sendNullSignal(getpid()));
+  EXPECT_EQ(-1, manager.readPid(run.Src("missing").c_str()));
+  EXPECT_EQ(-1, manager.readPid(run.Src().c_str()));  // a folder cannot be read
+  EXPECT_FALSE(manager.sendNullSignal(-1));
+  EXPECT_TRUE(manager.sendNullSignal(getpid()));
 }
 
 TEST(ServerChecks, PidFileDecidesWhetherTheServerRuns) {
@@ -40,37 +40,37 @@ TEST(ServerChecks, PidFileDecidesWhetherTheServerRuns) {
   for (const auto& [content, running] : std::vector<std::pair<std::string, int>>{
            {std::to_string(live.pid()), 1}, {std::to_string(exited), 0}, {"<none>", 0}, {"garbage", 1},
            {"", 1}}) {
-    TempDir root;
-    auto manager = MakeRun(root, "tqrs", "tqrs", "3.0", "3.0");
-    if (content != "<none>") WriteFile(root.Path("dst/tqrs.pid"), content);
-    EXPECT_EQ(running, manager->CheckEngineRunning(21, vxVersionDescriptor("3.0"), 0)) << content;
-    EXPECT_EQ(running == 1, LogEntries(root.Path("dst/vxmigrate.log")).back() == kEngineRuns);
+    Installations run(RunArgs("tqrs", "tqrs", "3.0", "3.0"));
+    if (content != "<none>") WriteFile(run.Dst("tqrs.pid"), content);
+    EXPECT_EQ(running, run.manager().CheckEngineRunning(21, vxVersionDescriptor("3.0"), 0))
+        << content;
+    EXPECT_EQ(running == 1, LogEntries(run.Dst("vxmigrate.log")).back() == kEngineRuns);
   }
 }
 
 TEST(ServerChecks, PidFileNamesFollowProductAndVersion) {
-  TempDir root;
-  auto manager = MakeRun(root, "tqrs", "obx", "3.0", "3.1");
+  Installations run(RunArgs("tqrs", "obx", "3.0", "3.1"));
+  vxMigrationManager& manager = run.manager();
   LiveProcess live;
   std::string pid = std::to_string(live.pid());
   vxVersionDescriptor v30("3.0"), v31("3.1");
-  WriteFile(root.Path("src/tqrs.pid"), pid);  // product 21 before 3.1, source side
-  EXPECT_EQ(1, manager->CheckEngineRunning(21, v30, 1));
-  EXPECT_EQ(0, manager->CheckEngineRunning(21, v31, 1));  // 3.1 reads "vxtq.pid"
-  WriteFile(root.Path("src/vxtq.pid"), pid);
-  EXPECT_EQ(1, manager->CheckEngineRunning(21, v31, 1));
-  EXPECT_EQ(0, manager->CheckEngineRunning(21, v31, 0));  // the destination has none
-  WriteFile(root.Path("dst/vxrs_ui.pid"), pid);
-  EXPECT_EQ(1, manager->CheckInterfaceRunning(20, v31, 0));
-  EXPECT_EQ(0, manager->CheckInterfaceRunning(20, v30, 0));  // before 3.1: "vxinterface.pid"
+  WriteFile(run.Src("tqrs.pid"), pid);  // product 21 before 3.1, source side
+  EXPECT_EQ(1, manager.CheckEngineRunning(21, v30, 1));
+  EXPECT_EQ(0, manager.CheckEngineRunning(21, v31, 1));  // 3.1 reads "vxtq.pid"
+  WriteFile(run.Src("vxtq.pid"), pid);
+  EXPECT_EQ(1, manager.CheckEngineRunning(21, v31, 1));
+  EXPECT_EQ(0, manager.CheckEngineRunning(21, v31, 0));  // the destination has none
+  WriteFile(run.Dst("vxrs_ui.pid"), pid);
+  EXPECT_EQ(1, manager.CheckInterfaceRunning(20, v31, 0));
+  EXPECT_EQ(0, manager.CheckInterfaceRunning(20, v30, 0));  // before 3.1: "vxinterface.pid"
   EXPECT_EQ("Error: Cannot migrate while Halden Interface Server is running - shut down to migrate",
-            LogEntries(root.Path("dst/vxmigrate.log")).back());
-  WriteFile(root.Path("dst/vxinterface.pid"), pid);
-  EXPECT_EQ(1, manager->CheckInterfaceRunning(21, v30, 0));
-  EXPECT_EQ(0, manager->CheckEngineRunning(1, v30, 0));  // products without servers
+            run.RunLog().back());
+  WriteFile(run.Dst("vxinterface.pid"), pid);
+  EXPECT_EQ(1, manager.CheckInterfaceRunning(21, v30, 0));
+  EXPECT_EQ(0, manager.CheckEngineRunning(1, v30, 0));  // products without servers
   // A source "folder" that is really a file holding a live pid is still no server.
-  WriteFile(root.Path("srcfile"), pid);
-  auto fileSource = MakeManager({"vxmigrate", "-D1:" + root.Path("srcfile"), "-D2:" + root.Path("dst"),
+  WriteFile(run.Src("file"), pid);
+  auto fileSource = MakeManager({"vxmigrate", "-D1:" + run.Src("file"), "-D2:" + run.Dst(),
                                  "-P1:pavsuite", "-P2:pavsuite", "-V1:5.0", "-V2:5.5"});
   EXPECT_EQ(0, fileSource->CheckEngineRunning(1, v30, 1));
   EXPECT_EQ(0, fileSource->CheckInterfaceRunning(1, v30, 1));
@@ -78,13 +78,12 @@ TEST(ServerChecks, PidFileNamesFollowProductAndVersion) {
 
 // A run checks the source engine before the destination interface.
 TEST(ServerChecks, TheRunChecksTheSourceEngineFirst) {
-  TempDir root;
+  Installations run(RunArgs("tqrs", "obx", "3.2", "3.2"));
   LiveProcess live;
-  auto manager = MakeRun(root, "tqrs", "obx", "3.2", "3.2");
-  WriteFile(root.Path("src/vxtq.pid"), std::to_string(live.pid()));
-  WriteFile(root.Path("dst/vxrs_ui.pid"), std::to_string(live.pid()));
-  EXPECT_EQ(1, manager->DoCheckMigrateValidity());
-  EXPECT_EQ(kEngineRuns, LogEntries(root.Path("dst/vxmigrate.log")).back());
+  WriteFile(run.Src("vxtq.pid"), std::to_string(live.pid()));
+  WriteFile(run.Dst("vxrs_ui.pid"), std::to_string(live.pid()));
+  EXPECT_EQ(1, run.manager().DoCheckMigrateValidity());
+  EXPECT_EQ(kEngineRuns, run.RunLog().back());
 }
 
 }  // namespace
